@@ -1,0 +1,70 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "Kiln/BlendMode.h"
+#include "Kiln/Device.h"
+#include "Vellum/Geometry.h"
+#include "Vellum/PixelFormat.h"
+
+/// Operations on device buffers. A buffer is a device value and its row bytes. All of them queue work and return; a
+/// negative status means that nothing was queued. Called under the device's exclusive access.
+namespace Kiln {
+
+using DeviceBuffer = std::uint64_t;
+
+/// Blue, green, red, alpha.
+struct float4 {
+    float x = 0.0F;
+    float y = 0.0F;
+    float z = 0.0F;
+    float w = 0.0F;
+
+    friend constexpr bool operator==(const float4& a, const float4& b) {
+        return a.x == b.x && a.y == b.y && a.z == b.z && a.w == b.w;
+    }
+};
+static_assert(sizeof(float4) == 16);
+
+/// Fills a rectangle of a buffer (left, top, width, height in pixels).
+Ostrand::Status FillWithColor(const DeviceRef& device, DeviceBuffer buffer, std::int32_t rowBytes,
+                              Vellum::PixelFormat format, std::int32_t left, std::int32_t top, std::int32_t width,
+                              std::int32_t height, const float4& color);
+Ostrand::Status FillWithTransparentBlack(const DeviceRef& device, DeviceBuffer buffer, std::int32_t rowBytes,
+                                         Vellum::PixelFormat format, std::int32_t left, std::int32_t top,
+                                         std::int32_t width, std::int32_t height);
+Ostrand::Status FillWithOpaqueBlack(const DeviceRef& device, DeviceBuffer buffer, std::int32_t rowBytes,
+                                    Vellum::PixelFormat format, std::int32_t left, std::int32_t top,
+                                    std::int32_t width, std::int32_t height);
+Ostrand::Status FillWithOpaqueWhite(const DeviceRef& device, DeviceBuffer buffer, std::int32_t rowBytes,
+                                    Vellum::PixelFormat format, std::int32_t left, std::int32_t top,
+                                    std::int32_t width, std::int32_t height);
+
+/// Resamples all of the source onto all of the target. `scaleX` and `scaleY` are target size over source size; they may
+/// differ from the quotient of the whole sizes by the fraction that rounding to pixels took away.
+Ostrand::Status Scale(const DeviceRef& device, DeviceBuffer source, std::int32_t sourceRowBytes,
+                      std::int32_t sourceWidth, std::int32_t sourceHeight, DeviceBuffer target,
+                      std::int32_t targetRowBytes, std::int32_t targetWidth, std::int32_t targetHeight,
+                      Vellum::PixelFormat format, float scaleX, float scaleY, Vellum::RenderQuality quality);
+
+/// Draws a layer: moves, scales and turns `source` into `target`.
+///
+/// The layer's anchor (fractions of the source) comes to lie on the position (fractions of the target). Around it the
+/// layer is scaled (factors; the source's pixel aspect over the target's is applied besides) and then turned clockwise by
+/// `rotation` degrees in square-pixel space. Pixels outside the source are transparent; edges are exact to a fraction of a
+/// pixel by coverage; colour is weighed by alpha.
+/// @param opacity          0.0 to 1.0, multiplies the layer's alpha.
+/// @param blendMode        an IR_BlendMode; unknown numbers draw as kBlend_Normal.
+/// @param overDestination  false: the layer replaces the target where its box lies, and the rest of the target stays;
+///                         true: it is blended over the target.
+Ostrand::Status Motion(const DeviceRef& device, DeviceBuffer source, std::int32_t sourceRowBytes,
+                       std::int32_t sourceLeft, std::int32_t sourceTop, std::int32_t sourceWidth,
+                       std::int32_t sourceHeight, std::int32_t sourceAspectNumerator,
+                       std::int32_t sourceAspectDenominator, DeviceBuffer target, std::int32_t targetRowBytes,
+                       std::int32_t targetLeft, std::int32_t targetTop, std::int32_t targetWidth,
+                       std::int32_t targetHeight, std::int32_t targetAspectNumerator,
+                       std::int32_t targetAspectDenominator, Vellum::PixelFormat format, float positionX,
+                       float positionY, float anchorX, float anchorY, float scaleX, float scaleY, float rotation,
+                       float opacity, std::int32_t blendMode, bool overDestination, Vellum::RenderQuality quality);
+
+}  // namespace Kiln

@@ -1,0 +1,86 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <atomic>
+#include <cstdint>
+#include <map>
+#include <set>
+#include <string>
+#include <utility>
+
+#include <boost/function.hpp>
+#include <boost/shared_ptr.hpp>
+
+#include "Marl/IVideoFrame.h"
+#include "Ostrand/CriticalSection.h"
+
+namespace Vantrel {
+
+using Halden::utility::Guid;
+using Marl::IVideoFrame;
+using Marl::VideoFrameRef;
+using Ostrand::InterfaceRef;
+using Ostrand::Status;
+
+class IRenderNode;
+
+/// One render request's frames, memo, log and outstanding work. The host makes one per request and keeps it until the
+/// frame is done. Thread safe, but for the pending requests, which only the thread of the request walk touches.
+///
+/// The completion function runs once, on whatever thread ends the last asynchronous piece. The host counts the piece of
+/// RenderSystem::PrepareRender itself: it sets `outstanding` to 1 when it sets the completion.
+class RenderResults {
+public:
+    RenderResults() = default;
+    explicit RenderResults(boost::function<void()> completion, std::uint32_t outstanding = 1)
+        : mOutstanding(outstanding), mCompletion(std::move(completion)) {}
+
+    /// Answered by FindPendingRequest for a fingerprint without a request.
+    static constexpr Status kStatus_NoRequest = static_cast<Status>(0x80000000);
+
+    [[nodiscard]] VideoFrameRef FindFrame(const Guid& hash) const;
+    /// Keeps the frame, which may be empty, unless one stands under that fingerprint already.
+    void StoreFrame(const Guid& hash, const VideoFrameRef& frame);
+    void RemoveFrame(const Guid& hash);
+
+    /// 0 and the id of the host request in flight, or kStatus_NoRequest.
+    [[nodiscard]] Status FindPendingRequest(const Guid& hash, std::uint32_t& id) const;
+    void AddPendingRequest(const Guid& hash, std::uint32_t id);
+
+    [[nodiscard]] bool FindHash(const IRenderNode* node, std::int64_t time, Guid& hash) const;
+    void StoreHash(const IRenderNode* node, std::int64_t time, const Guid& hash);
+
+    /// Puts text before the log, once per fingerprint.
+    void AppendLog(const Guid& hash, const std::string& text);
+    [[nodiscard]] std::string GetLog() const;
+
+    /// The input frame that a multicam node marks as the one on air.
+    [[nodiscard]] VideoFrameRef GetSelectedFrame() const;
+    void SetSelectedFrame(const VideoFrameRef& frame);
+
+    /// Has a host render of this request delivered nothing?
+    [[nodiscard]] bool HasFailed() const { return mFailed != 0; }
+    void SetFailed() { mFailed = 1; }
+
+    /// Without a completion function both do nothing.
+    void BeginAsyncPiece();
+    void EndAsyncPiece();
+    [[nodiscard]] std::uint32_t GetOutstanding() const { return mOutstanding; }
+
+private:
+    mutable Ostrand::CriticalSection mLock{"RenderResults"};
+    VideoFrameRef mSelectedFrame;
+    std::map<Guid, VideoFrameRef> mFrames;
+    std::map<Guid, std::uint32_t> mPendingRequests;
+    std::map<std::pair<const IRenderNode*, std::int64_t>, Guid> mHashes;
+    std::atomic<std::uint32_t> mFailed{0};
+    std::set<Guid> mLoggedFrames;
+    std::string mLog;
+    std::atomic<std::uint32_t> mOutstanding{0};
+    boost::function<void()> mCompletion;
+};
+
+using RenderResultsRef = boost::shared_ptr<RenderResults>;
+
+}  // namespace Vantrel
