@@ -48,9 +48,15 @@ public:
     [[nodiscard]] virtual const boost::shared_ptr<MemoryManager>& GetDeviceMemory() const = 0;
     [[nodiscard]] virtual const boost::shared_ptr<MemoryManager>& GetHostMemory() const = 0;
 
-    /// The device module of a source path ("..\\..\\Src\\Filters\\Effects\\InvertNode"): a CUmodule or cl_program, built
-    /// at first use and kept. 0 when there is none, or when it doesn't build; the reason is then traced under "Kiln.Module".
+    /// The device module of a source path ("..\\..\\Src\\Filters\\Effects\\InvertNode"): a CUmodule or cl_program,
+    /// built at first use and kept. 0 when there is none, or when it doesn't build; the reason is then traced under
+    /// "Kiln.Module".
     [[nodiscard]] virtual std::uint64_t FindModule(const char* key) = 0;
+    /// Why FindModule gave 0 for a key: the build log, or what else was wrong. Empty for a module that was built.
+    [[nodiscard]] virtual std::string GetModuleMessage(const char* key) = 0;
+    /// A kernel of one of those modules: a CUfunction or cl_kernel, which lives as long as the device; 0 when the
+    /// module or the kernel isn't there. Looked up once.
+    [[nodiscard]] virtual std::uint64_t FindKernel(const char* moduleKey, const char* kernelName) = 0;
 
     /// One thread; posted functions run in order.
     [[nodiscard]] virtual const boost::shared_ptr<Halden::threads::AsyncExecutor>& GetExecutor() const = 0;
@@ -102,8 +108,8 @@ void Terminate();
 /// Why a framework has no device, or an empty text.
 [[nodiscard]] std::string GetFrameworkMessage(DeviceFramework framework);
 
-/// The file that the name of the CUDA driver's library stands for on this machine: the real driver where it has a device,
-/// else the CPU driver. Empty when neither is there or the environment says "none". Decided once per process.
+/// The file that the name of the CUDA driver's library stands for on this machine: the real driver where it has a
+/// device, else the CPU driver. Empty when neither is there or the environment says "none". Decided once per process.
 [[nodiscard]] std::string GetCudaDriverPath();
 
 /// Tells Kiln a name that the library above can render; hosts list them.

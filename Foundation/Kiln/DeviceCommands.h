@@ -17,6 +17,10 @@ public:
     virtual ~TimingMark() = default;
     /// Device time from this mark to a later one, in milliseconds. Waits until the later one is reached; 0 on failure.
     [[nodiscard]] virtual float ElapsedMs(const TimingMark& later) const = 0;
+    /// Has everything queued before the mark run? Doesn't wait. Any thread. A queue that failed counts as reached.
+    [[nodiscard]] virtual bool IsReached() const = 0;
+    /// Returns when the mark is reached. Any thread.
+    virtual void Wait() const = 0;
 };
 using TimingMarkRef = boost::shared_ptr<TimingMark>;
 

@@ -4,8 +4,10 @@
 
 #include <cstdint>
 
+#include <boost/function.hpp>
 #include <boost/shared_ptr.hpp>
 
+#include "Kiln/DeviceCommands.h"
 #include "Kiln/FrameCache.h"
 
 namespace Kiln {
@@ -26,8 +28,8 @@ struct MemoryStatistics {
     std::uint64_t refusals = 0;
 };
 
-/// A pool of one kind of memory: a device's own, or host memory that the device can read fast. Blocks given back are kept
-/// for reuse until ReleaseUnused, or until an allocation needs their room. Thread safe.
+/// A pool of one kind of memory: a device's own, or host memory that the device can read fast. Blocks given back are
+/// kept for reuse until ReleaseUnused, or until an allocation needs their room. All of it from any thread.
 class MemoryManager {
 public:
     virtual ~MemoryManager() = default;
@@ -37,6 +39,11 @@ public:
     [[nodiscard]] virtual std::uint64_t Allocate(std::uint64_t bytes) = 0;
     /// Gives a block back to the pool. Work already queued on the device may still use it: reuse is ordered behind it.
     virtual void Free(std::uint64_t block) = 0;
+    /// As above, for a caller who knows the last work that uses the block: `lastUse` is a mark behind that work. An
+    /// empty mark stands for all that is queued.
+    virtual void Free(std::uint64_t block, const TimingMarkRef& lastUse) = 0;
+    /// Was the block that this address lies in handed out by this manager, and not given back?
+    [[nodiscard]] virtual bool Owns(std::uint64_t address) const = 0;
 
     [[nodiscard]] virtual MemoryFigures GetFigures() const = 0;
     [[nodiscard]] virtual MemoryStatistics GetStatistics() const = 0;
@@ -47,6 +54,10 @@ public:
 
     /// The cache of frames that live in this memory.
     [[nodiscard]] virtual FrameCache& GetFrameCache() = 0;
+
+    /// For tests of refusals: asked with the bytes of each allocation, and true refuses it at once, whatever room there
+    /// is. An empty function, the default, refuses nothing. Called without a lock, possibly on several threads.
+    virtual void SetAllocationFilter(boost::function<bool(std::uint64_t bytes)> refuse) = 0;
 };
 
 }  // namespace Kiln
