@@ -15,12 +15,12 @@ struct PluginID {
 
 [[nodiscard]] PluginID GuidToPluginID(const Halden::utility::Guid& guid);
 
-/// The host's field type (0 progressive, 1 upper first, 2 lower first, 3 any, 4 separate fields) as Vellum's. The numbers
-/// agree; anything else becomes Vellum::kFieldType_Unknown.
+/// The host's field type (0 progressive, 1 upper first, 2 lower first, 3 any, 4 separate fields) as Vellum's. The
+/// numbers agree; anything else becomes Vellum::kFieldType_Unknown.
 [[nodiscard]] std::uint32_t SDKToBEFieldType(std::uint32_t fieldType);
 
-/// The host's alpha type (0 none, 1 straight, 2 premultiplied) with 0 kept as it is: a reader decides what no alpha means
-/// to it. Anything else becomes Vellum::kAlphaType_Straight.
+/// The host's alpha type (0 none, 1 straight, 2 premultiplied) with 0 kept as it is: a reader decides what no alpha
+/// means to it. Anything else becomes Vellum::kAlphaType_Straight.
 [[nodiscard]] std::uint32_t SDKToBEAlphaType(std::int32_t alphaType);
 
 /// The host's pulldown cadence; 0 is none, 1 to 5 the phases of 2:3, 6 to 10 those of 2:3:3:2. Anything else becomes 0.

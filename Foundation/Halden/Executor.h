@@ -11,7 +11,8 @@
 namespace Halden::threads {
 
 /// Runs posted functions one at a time, in the order posted. Destroying the last reference waits for nothing: functions
-/// already posted still run. A function that throws ends the process, as an uncaught exception on any thread does.
+/// already posted still run, at the latest while the process ends normally, which waits for them. A function posted
+/// after that is dropped. A function that throws ends the process, as an uncaught exception on any thread does.
 class AsyncExecutor {
 public:
     virtual ~AsyncExecutor() = default;

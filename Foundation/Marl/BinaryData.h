@@ -12,8 +12,8 @@ namespace Marl {
 
 using BinaryData = std::vector<std::uint8_t>;
 
-/// Decodes base64 text (RFC 4648, padding demanded, no line breaks). On failure `out` is emptied and kStatus_Failure
-/// comes back.
+/// Decodes base64 text (RFC 4648, padding demanded and its unused bits zero, no line breaks). On failure `out` is
+/// emptied and kStatus_Failure comes back.
 [[nodiscard]] Ostrand::Status DecodeBinaryDataFromUTF8String(const std::string& text, BinaryData& out);
 
 /// The inverse.

@@ -22,7 +22,10 @@ public:
 template <class T>
 class Allocated {
 public:
-    static void* operator new(std::size_t bytes) { return Allocator::Allocate(bytes); }
+    static void* operator new(std::size_t bytes) {
+        static_assert(alignof(T) <= alignof(std::max_align_t), "the allocator knows no wider alignment");
+        return Allocator::Allocate(bytes);
+    }
     static void operator delete(void* block) noexcept { Allocator::Dispose(block); }
 
 protected:

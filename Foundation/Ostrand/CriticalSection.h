@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <atomic>
 #include <mutex>
 
 namespace Ostrand {
@@ -18,13 +19,15 @@ public:
     void Leave();
 
     [[nodiscard]] const char* GetName() const { return mName; }
-    /// The section that holds the lock, or null. A snapshot, for messages of a hang.
-    [[nodiscard]] const char* GetHolder() const { return mHolder; }
+    /// The outermost section that holds the lock, or null. A snapshot, for messages of a hang.
+    [[nodiscard]] const char* GetHolder() const { return mHolder.load(std::memory_order_relaxed); }
 
 private:
     std::recursive_mutex mMutex;
     const char* mName;
-    const char* volatile mHolder = nullptr;
+    // Written by the holder only; atomic for those who ask from outside.
+    std::atomic<const char*> mHolder{nullptr};
+    int mDepth = 0;
 };
 
 /// Holds a critical section for a scope.

@@ -19,8 +19,9 @@ struct HashValue {
 };
 
 struct MixHash {
-    /// Mixes bytes into a state (XXH3, 128 bit, seeded by the state and folded back into it). Deterministic on every
-    /// machine of one byte order; fingerprints are only compared with each other.
+    /// Mixes bytes into a state: XXH3, 128 bit, of the bytes, then of the state joined with that. Deterministic on
+    /// every machine of one byte order; fingerprints are only compared with each other. `bytes` may be null for length
+    /// 0.
     static void MixInData(HashValue& value, const void* bytes, std::size_t length);
 };
 
@@ -41,6 +42,7 @@ public:
         return Bytes(&value, sizeof value);
     }
 
+    /// The fingerprint of all items so far.
     [[nodiscard]] Halden::utility::Guid Finish() const;
 
 private:

@@ -35,8 +35,9 @@ struct Glaze {
 
 namespace Tarn {
 
-/// Wraps a host picture as a frame without copying it. Empty when the record isn't sound: an unknown size or pixel format,
-/// no pixels, sizes that aren't positive, rows that overlap. The record may be disposed of afterwards.
+/// Wraps a host picture as a frame without copying it. Empty when the record isn't sound: an unknown size or pixel
+/// format, no pixels or no counted storage, sizes that aren't positive, rows that overlap. The record may be disposed
+/// of afterwards.
 [[nodiscard]] Marl::VideoFrameRef GetVideoFrameFromGlaze(const Glaze* glaze);
 
 /// The host's four-character code as a pixel format; the invalid format for an unknown one.

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <cstddef>
 #include <cstdint>
 #include <string>
 
@@ -94,13 +95,13 @@ constexpr PixelFormat kPixelFormat_GPU_BGRX_4444_16f{PixelFormatBits::kClassRGB 
 /// Bytes of one pixel of any valid format; 0 for the invalid one.
 [[nodiscard]] std::size_t BytesPerPixel(PixelFormat format);
 
-/// Bytes of a tightly packed picture.
+/// Bytes of a tightly packed picture; 0 for the invalid format and for sizes that aren't positive.
 [[nodiscard]] std::uint64_t PixelFormatSize(PixelFormat format, std::int32_t width, std::int32_t height);
 
 /// The host's code as a format; the invalid format for a code that is none of the above.
 [[nodiscard]] PixelFormat PixelFormatFromCode(std::uint32_t code);
 
-/// For logs: "BGRA_4444_8u", "GPU_BGRA_4444_16f", "Invalid", ...
+/// For logs: "BGRA_4444_8u", "GPU_BGRA_4444_16f", "Invalid"; an unknown format's value in hexadecimal.
 [[nodiscard]] std::string ToText(PixelFormat format);
 
 }  // namespace Vellum

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <limits>
 
 namespace Vellum {
 
@@ -17,8 +18,16 @@ class FrameRate {
 public:
     constexpr FrameRate() = default;
     [[nodiscard]] static constexpr FrameRate Create(std::int64_t ticksPerFrame) { return FrameRate(ticksPerFrame); }
-    /// The exact duration for `numerator` / `denominator` frames a second, rounded half up where it isn't whole.
-    [[nodiscard]] static FrameRate FromFraction(std::int64_t numerator, std::int64_t denominator);
+    /// The exact duration for `numerator` / `denominator` frames a second, rounded half up where it isn't whole. The
+    /// zero rate for a fraction that isn't positive, and for one whose frame is longer than 64 bits of ticks.
+    [[nodiscard]] static constexpr FrameRate FromFraction(std::int64_t numerator, std::int64_t denominator) {
+        __extension__ using Wide = __int128;
+        if (numerator <= 0 || denominator <= 0) return {};
+        const Wide twice = 2 * static_cast<Wide>(kTicksPerSecond) * denominator + numerator;
+        const Wide ticks = twice / (2 * static_cast<Wide>(numerator));
+        if (ticks > std::numeric_limits<std::int64_t>::max()) return {};
+        return FrameRate(static_cast<std::int64_t>(ticks));
+    }
 
     [[nodiscard]] constexpr std::int64_t GetTicksPerFrame() const { return mTicksPerFrame; }
 
@@ -55,7 +64,8 @@ public:
 
     [[nodiscard]] constexpr std::int64_t GetTicks() const { return mTicks; }
 
-    /// Moves the time back to the start of the frame that it lies in (floor, also below 0). The zero rate changes nothing.
+    /// Moves the time back to the start of the frame that it lies in (floor, also below 0). The zero rate changes
+    /// nothing.
     constexpr void AlignToFrame(FrameRate rate) {
         const std::int64_t frame = rate.GetTicksPerFrame();
         if (frame <= 0) return;
