@@ -34,9 +34,9 @@ struct LayerDrawing {
 /// anchor. A layer that isn't turned, or by right angles, and whose border comes within 1/512 pixel of a pixel's border
 /// counts as lying on it: fractions of a frame in single precision miss whole pixels by so much.
 ///
-/// Coverage is the share of the pixel, as wide as it is across the layer's border, that lies inside; for a layer that
-/// isn't turned that is the exact share. A layer that maps pixels onto pixels is copied without a filter; see Sample
-/// for the others.
+/// Coverage is the share of a pixel's width across the layer's border that lies inside, for both directions multiplied;
+/// for a layer that isn't turned that is the exact share of the pixel. A layer whose pixels fall onto the target's is
+/// copied without a filter; see Sample for the others. A layer that replaces is mixed by coverage with what it replaces.
 void DrawLayer(const Picture& layer, const LayerDrawing& drawing, Picture& target);
 
 }  // namespace Vantrel::Host::Software
