@@ -1,0 +1,84 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include "Halden/Trace.h"
+
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <thread>
+#include <vector>
+
+namespace debug = Halden::debug;
+
+namespace {
+
+/// Collects lines for its lifetime. The vector has no lock of its own: the sink is never called twice at once.
+class CollectedLines {
+public:
+    CollectedLines() {
+        debug::SetTraceSink([this](const std::string& line) { mLines.push_back(line); });
+    }
+    ~CollectedLines() { debug::SetTraceSink({}); }
+    CollectedLines(const CollectedLines&) = delete;
+    CollectedLines& operator=(const CollectedLines&) = delete;
+
+    [[nodiscard]] const std::vector<std::string>& Get() const { return mLines; }
+
+private:
+    std::vector<std::string> mLines;
+};
+
+}  // namespace
+
+TEST(Tracing, IsGatedByCategoryAndLevel) {
+    EXPECT_FALSE(debug::TraceEnabled("Test.Levels", 0, 1));
+    debug::SetTraceLevel("Test.Levels", 10);
+    EXPECT_TRUE(debug::TraceEnabled("Test.Levels", 0, 1));
+    EXPECT_TRUE(debug::TraceEnabled("Test.Levels", 10, 1));
+    EXPECT_FALSE(debug::TraceEnabled("Test.Levels", 11, 1));
+    EXPECT_FALSE(debug::TraceEnabled("Test.Level", 10, 1));
+    debug::SetTraceLevel("Test.Levels", -1);
+    EXPECT_FALSE(debug::TraceEnabled("Test.Levels", 0, 1));
+}
+
+TEST(Tracing, CountsChangesOnly) {
+    const std::uint32_t start = debug::TraceChangeCount();
+    EXPECT_NE(start, 0U);
+    debug::SetTraceLevel("Test.Count", -1);
+    EXPECT_EQ(debug::TraceChangeCount(), start) << "the category was off already";
+    debug::SetTraceLevel("Test.Count", 5);
+    const std::uint32_t enabled = debug::TraceChangeCount();
+    EXPECT_NE(enabled, start);
+    debug::SetTraceLevel("Test.Count", 5);
+    EXPECT_EQ(debug::TraceChangeCount(), enabled);
+    debug::SetTraceLevel("Test.Count", 4);
+    EXPECT_NE(debug::TraceChangeCount(), enabled);
+    debug::SetTraceLevel("Test.Count", -1);
+}
+
+TEST(Tracing, GateFollowsItsCategory) {
+    debug::TraceGate gate("Test.Gate", 10);
+    EXPECT_FALSE(gate.IsOpen());
+    debug::SetTraceLevel("Test.Gate", 10);
+    EXPECT_TRUE(gate.IsOpen());
+    debug::SetTraceLevel("Test.Other", 10);
+    EXPECT_TRUE(gate.IsOpen());
+    debug::SetTraceLevel("Test.Gate", 9);
+    EXPECT_FALSE(gate.IsOpen());
+    debug::SetTraceLevel("Test.Gate", -1);
+    debug::SetTraceLevel("Test.Other", -1);
+}
+
+TEST(Tracing, WritesWholeLinesFromManyThreads) {
+    const CollectedLines lines;
+    const debug::TraceGate gate("Test.Lines", 10);
+    std::vector<std::thread> threads;
+    for (int i = 0; i < 4; ++i) {
+        threads.emplace_back([&gate] {
+            for (int k = 0; k < 100; ++k) gate.Write("message");
+        });
+    }
+    for (std::thread& thread : threads) thread.join();
+    EXPECT_EQ(lines.Get().size(), 400U);
+    EXPECT_THAT(lines.Get(), testing::Each(testing::MatchesRegex("<[0-9]+> <Test.Lines> <10> message")));
+}
