@@ -108,7 +108,7 @@ TEST(SoftwareConvert, MeetsTheAnchorsOfVideoLevels) {
     } kCases[] = {{Vellum::kPixelFormat_VUYA_4444_8u, {128, 128, 235, 255}, {1, 1, 1, 1}},
                   {Vellum::kPixelFormat_VUYA_4444_8u, {128, 128, 16, 51}, {0, 0, 0, 0.2}},
                   {Vellum::kPixelFormat_VUYA_4444_8u, {142, 44, 162, 255}, {0, 0.75, 0.75, 1}},
-                  {Vellum::kPixelFormat_VUYA_4444_8u_709, {133, 44, 168, 255}, {0, 0.75, 0.75, 1}},
+                  {Vellum::kPixelFormat_VUYA_4444_8u_709, {136, 44, 168, 255}, {0, 0.75, 0.75, 1}},
                   {Vellum::kPixelFormat_VUYA_4444_8u_709, {120, 212, 28, 255}, {0.75, 0, 0, 1}},
                   {Vellum::kPixelFormat_XRGB_4444_8u, {0, 255, 51, 0}, {0, 0.2, 1, 1}},
                   {Vellum::kPixelFormat_BGRP_4444_8u, {51, 0, 102, 102}, {0.5, 0, 1, 0.4}}};
