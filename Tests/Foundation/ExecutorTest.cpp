@@ -4,10 +4,13 @@
 
 #include <gtest/gtest.h>
 
+#include <algorithm>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
+#include <filesystem>
 #include <future>
+#include <iterator>
 #include <memory>
 #include <stdexcept>
 #include <thread>
@@ -30,6 +33,10 @@ private:
 };
 
 ExecutorRef ThreadKind() { return Halden::threads::CreateThreadExecutor("executor under test"); }
+
+std::ptrdiff_t ThreadsOfThisProcess() {
+    return std::distance(std::filesystem::directory_iterator("/proc/self/task"), {});
+}
 
 class EveryExecutor : public testing::TestWithParam<ExecutorRef (*)()> {};
 
@@ -123,6 +130,7 @@ INSTANTIATE_TEST_SUITE_P(, EveryExecutor, testing::Values(&ThreadKind, &Halden::
                          [](const auto& kind) { return kind.index == 0 ? "OwnThread" : "SharedPool"; });
 
 TEST(SharedPool, RunsManyExecutorsAtOnceEachInItsOrder) {
+    const std::ptrdiff_t threadsBefore = ThreadsOfThisProcess();
     const ExecutorRef waiting = Halden::threads::CreateCPUBoundExecutor();
     Door door;
     waiting->Post([&door] { door.Wait(); }, 0);
@@ -135,6 +143,7 @@ TEST(SharedPool, RunsManyExecutorsAtOnceEachInItsOrder) {
             executors[i]->Post([&length = lengths[i], round] { length = length == round ? round + 1 : -1000; }, 0);
         }
     }
+    EXPECT_LE(ThreadsOfThisProcess() - threadsBefore, std::max(2U, std::thread::hardware_concurrency()));
     // The waiting executor occupies one thread of the pool all the while.
     for (const ExecutorRef& executor : executors) executor->Drain();
     for (const int length : lengths) EXPECT_EQ(length, 20);
