@@ -1,0 +1,415 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include "Host/Timeline/EffectTables.h"
+
+#include <algorithm>
+#include <initializer_list>
+#include <utility>
+
+namespace Vantrel::Host {
+namespace {
+
+using Type = ParameterType;
+
+constexpr double kNormalBlend = 18;
+constexpr double kFullScale = 255;
+
+/// Puts a table together; indices that nobody reads are filled so that every index up to the highest one exists.
+class Builder {
+public:
+    explicit Builder(const char* matchName) { mTable.matchName = matchName; }
+
+    Builder& Row(std::int32_t index, std::string name, Type type, ParameterValue value = {}) & {
+        while (static_cast<std::int32_t>(mTable.parameters.size()) < index) {
+            Parameter filler;
+            filler.index = static_cast<std::int32_t>(mTable.parameters.size());
+            mTable.parameters.push_back(filler);
+        }
+        Parameter parameter;
+        parameter.index = index;
+        parameter.name = std::move(name);
+        parameter.type = type;
+        parameter.value = value;
+        mTable.parameters.push_back(std::move(parameter));
+        return *this;
+    }
+
+    /// Rows from `first` on of one type, with their names and values.
+    Builder& Rows(std::int32_t first, Type type, std::initializer_list<std::pair<const char*, double>> rows) & {
+        for (const auto& [name, value] : rows) Row(first++, name, type, {value});
+        return *this;
+    }
+
+    Builder& DependsOnTime() & {
+        mTable.timeDependent = true;
+        return *this;
+    }
+
+    [[nodiscard]] EffectTable Finish() & { return std::move(mTable); }
+
+private:
+    EffectTable mTable;
+};
+
+/// Limits a correction to part of the picture, chosen by colour: the same 26 parameters in five correctors.
+void AddSecondary(Builder& table, std::int32_t base) {
+    table.Rows(base, Type::kDouble,
+               {{"secondary_hue_center", 0},
+                {"secondary_hue_start", 50},
+                {"secondary_hue_start_softness", 0},
+                {"secondary_hue_end", 50},
+                {"secondary_hue_end_softness", 0}});
+    table.Rows(base + 9, Type::kDouble,
+               {{"secondary_saturation_start", 0},
+                {"secondary_saturation_start_softness", 0},
+                {"secondary_saturation_end", 100},
+                {"secondary_saturation_end_softness", 0}});
+    table.Rows(base + 17, Type::kDouble,
+               {{"secondary_luma_start", 0},
+                {"secondary_luma_start_softness", 0},
+                {"secondary_luma_end", 100},
+                {"secondary_luma_end_softness", 0}});
+    table.Rows(base + 23, Type::kDouble, {{"secondary_soften", 0}, {"secondary_edge_thinning", 0}});
+    table.Row(base + 25, "secondary_invert", Type::kInt);
+}
+
+void AddTonalRange(Builder& table, std::int32_t base) {
+    table.Rows(
+        base, Type::kDouble,
+        {{"shadow_threshold", 64}, {"shadow_softness", 64}, {"highlight_threshold", 192}, {"highlight_softness", 192}});
+}
+
+/// Output mode and split view, as most correctors begin.
+void AddCorrectorHead(Builder& table) {
+    table.Row(0, "output", Type::kInt)
+        .Row(1, "split_view", Type::kBool)
+        .Row(2, "split_layout", Type::kInt)
+        .Row(3, "split_percent", Type::kDouble, {50});
+}
+
+constexpr const char* kTonalSets[] = {"master", "shadow", "midtone", "highlight"};
+
+EffectTable LumaCorrector() {
+    Builder table("TQ.XQVE Luma Corrector");
+    AddCorrectorHead(table);
+    AddTonalRange(table, 6);
+    std::int32_t index = 13;
+    for (const std::string set : kTonalSets) {
+        for (const auto& [name, value] : {std::pair{"brightness", 0.0},
+                                          {"contrast", 0.0},
+                                          {"contrast_level", 0.5},
+                                          {"gamma", 1.0},
+                                          {"pedestal", 0.0},
+                                          {"gain", 1.0}}) {
+            table.Row(index++, set + "_" + name, Type::kDouble, {value});
+        }
+    }
+    table.Row(39, "show_mask", Type::kBool);
+    AddSecondary(table, 44);
+    return table.Finish();
+}
+
+void AddGammaPedestalGain(Builder& table, std::int32_t base, const std::string& prefix) {
+    table.Row(base, prefix + "_gamma", Type::kDouble, {1})
+        .Row(base + 1, prefix + "_pedestal", Type::kDouble, {0})
+        .Row(base + 2, prefix + "_gain", Type::kDouble, {1});
+}
+
+EffectTable RgbColorCorrector() {
+    Builder table("TQ.XQVE RGB Color Corrector");
+    AddCorrectorHead(table);
+    AddTonalRange(table, 6);
+    std::int32_t index = 13;
+    for (const std::string set : kTonalSets) {
+        AddGammaPedestalGain(table, index, set);
+        index += 3;
+    }
+    index = 26;
+    for (const std::string set : kTonalSets) {
+        for (const char* channel : {"_red", "_green", "_blue"}) {
+            AddGammaPedestalGain(table, index, set + channel);
+            index += 3;
+        }
+    }
+    table.Row(65, "show_mask", Type::kBool);
+    AddSecondary(table, 70);
+    return table.Finish();
+}
+
+void AddWheel(Builder& table, std::int32_t base, const std::string& prefix) {
+    table.Row(base, prefix + "_amount", Type::kDouble)
+        .Row(base + 1, prefix + "_gain", Type::kDouble)
+        .Row(base + 2, prefix + "_angle", Type::kFloat);
+}
+
+EffectTable ThreeWayColorCorrector() {
+    Builder table("TQ.XQVE Three-Way Color Corrector");
+    table.Row(0, "output", Type::kInt)
+        .Row(2, "split_view", Type::kBool)
+        .Row(3, "split_layout", Type::kInt)
+        .Row(4, "split_percent", Type::kDouble, {50})
+        .Row(18, "show_tonal_range", Type::kBool);
+    AddTonalRange(table, 19);
+    table.Rows(25, Type::kDouble,
+               {{"shadow_saturation", 100}, {"midtone_saturation", 100}, {"highlight_saturation", 100}});
+    table.Row(32, "show_mask", Type::kBool);
+    AddSecondary(table, 37);
+    std::int32_t index = 76;
+    for (const std::string set : {"shadow", "midtone", "highlight"}) {
+        table.Row(index, set + "_hue_angle", Type::kFloat);
+        AddWheel(table, index + 1, set + "_balance");
+        index += 6;
+    }
+    table.Row(94, "master_hue_angle", Type::kFloat);
+    AddWheel(table, 95, "master_balance");
+    table.Rows(100, Type::kDouble,
+               {{"input_black", 0},
+                {"input_gamma", 1},
+                {"input_white", kFullScale},
+                {"output_black", 0},
+                {"output_white", kFullScale}});
+    return table.Finish();
+}
+
+EffectTable FastColorCorrector() {
+    Builder table("TQ.XQVE Fast Color Corrector");
+    AddCorrectorHead(table);
+    table.Row(6, "hue_angle", Type::kFloat)
+        .Row(7, "balance_amount", Type::kDouble)
+        .Row(8, "balance_gain", Type::kDouble)
+        .Row(9, "balance_angle", Type::kFloat)
+        .Row(11, "saturation", Type::kDouble, {100});
+    table.Rows(21, Type::kDouble,
+               {{"input_black", 0},
+                {"input_gamma", 1},
+                {"input_white", kFullScale},
+                {"output_black", 0},
+                {"output_white", kFullScale}});
+    return table.Finish();
+}
+
+/// Sixteen control points from `first` on: a straight line, and the rest unused.
+void AddCurve(Builder& table, std::int32_t first, const std::string& prefix) {
+    constexpr std::int32_t kPoints = 16;
+    for (std::int32_t i = 0; i < kPoints; ++i) {
+        const double value = i == 1 ? kFullScale : 0;
+        table.Row(first + 2 * i, prefix + "x" + std::to_string(i), Type::kDouble, {value});
+        table.Row(first + 2 * i + 1, prefix + "y" + std::to_string(i), Type::kDouble, {value});
+    }
+}
+
+EffectTable LumaCurve() {
+    Builder table("TQ.XQVE Luma Curve");
+    AddCorrectorHead(table);
+    AddCurve(table, 5, "");
+    table.Row(40, "show_mask", Type::kBool);
+    AddSecondary(table, 45);
+    return table.Finish();
+}
+
+EffectTable RgbCurves() {
+    Builder table("TQ.XQVE RGB Curves");
+    AddCorrectorHead(table);
+    std::int32_t first = 5;
+    for (const char* prefix : {"master_", "red_", "green_", "blue_"}) {
+        AddCurve(table, first, prefix);
+        first += 32;
+    }
+    table.Row(136, "show_mask", Type::kBool);
+    AddSecondary(table, 141);
+    return table.Finish();
+}
+
+EffectTable Levels() {
+    Builder table("KL.XQVE Levels");
+    std::int32_t index = 0;
+    for (const std::string group : {"rgb", "red", "green", "blue"}) {
+        for (const auto& [name, value] : {std::pair{"black_in", 0.0},
+                                          {"white_in", kFullScale},
+                                          {"black_out", 0.0},
+                                          {"white_out", kFullScale},
+                                          {"gamma", 100.0}}) {
+            table.Row(index++, group + "_" + name, Type::kInt, {value});
+        }
+    }
+    return table.Finish();
+}
+
+/// A polygon of `count` corners that goes round the frame's edge clockwise from the top left.
+EffectTable GarbageMatte(const char* matchName, std::int32_t count) {
+    Builder table(matchName);
+    const std::int32_t perSide = count / 4;
+    for (std::int32_t i = 0; i < count; ++i) {
+        const double along = static_cast<double>(i % perSide) / perSide;
+        const ParameterValue corners[] = {{along, 0}, {1, along}, {1 - along, 1}, {0, 1 - along}};
+        table.Row(i, "corner" + std::to_string(i), Type::kPoint, corners[i / perSide]);
+    }
+    return table.Finish();
+}
+
+EffectTable UltraKey() {
+    Builder table("TQ.XQVE Ultra Key");
+    table.Row(0, "output", Type::kInt).Row(2, "key_color", Type::kColor, {0, 1, 0, 1});
+    table.Rows(4, Type::kDouble,
+               {{"transparency", 45}, {"highlight", 10}, {"shadow", 50}, {"tolerance", 50}, {"pedestal", 10}});
+    table.Rows(11, Type::kDouble, {{"choke", 0}, {"soften", 0}, {"contrast", 0}, {"mid_point", 50}});
+    table.Rows(17, Type::kDouble, {{"desaturate", 25}, {"range", 50}, {"spill", 50}, {"luma", 50}});
+    table.Rows(23, Type::kDouble, {{"saturation", 100}, {"hue", 0}, {"luminance", 100}});
+    return table.Finish();
+}
+
+EffectTable VideoLimiter() {
+    Builder table("TQ.XQVE Video Limiter");
+    table.Row(0, "split_view", Type::kBool)
+        .Row(1, "split_layout", Type::kInt)
+        .Row(2, "split_percent", Type::kDouble, {50});
+    table.Row(3, "reduction_axis", Type::kInt);
+    table.Rows(4, Type::kDouble,
+               {{"luma_min", 0},
+                {"luma_max", 100},
+                {"chroma_min", 0},
+                {"chroma_max", 100},
+                {"signal_min", 0},
+                {"signal_max", 100}});
+    table.Row(10, "reduction_method", Type::kInt);
+    AddTonalRange(table, 13);
+    return table.Finish();
+}
+
+EffectTable Timecode() {
+    Builder table("TQ.XQVE Lspr Timecode");
+    table.Row(0, "position", Type::kPoint, {0.5, 0.9})
+        .Rows(1, Type::kFloat, {{"size", 20}, {"opacity", 100}})
+        .Row(3, "field_symbol", Type::kBool)
+        .Rows(4, Type::kInt, {{"format", 0}, {"source", 0}, {"time_display", 0}})
+        .Row(7, "offset", Type::kFloat)
+        .Rows(8, Type::kInt, {{"starting_frame", 0}, {"label", 0}})
+        .DependsOnTime();
+    return table.Finish();
+}
+
+EffectTable Simple(const char* matchName, std::initializer_list<Parameter> parameters, bool timeDependent = false) {
+    Builder table(matchName);
+    std::int32_t index = 0;
+    for (const Parameter& parameter : parameters) table.Row(index++, parameter.name, parameter.type, parameter.value);
+    if (timeDependent) table.DependsOnTime();
+    return table.Finish();
+}
+
+Parameter P(const char* name, Type type, ParameterValue value = {}) {
+    Parameter parameter;
+    parameter.name = name;
+    parameter.type = type;
+    parameter.value = value;
+    return parameter;
+}
+
+void AddPointwise(std::vector<EffectTable>& tables) {
+    const ParameterValue black{0, 0, 0, 1};
+    const ParameterValue white{1, 1, 1, 1};
+    tables.push_back(Simple("TQ.XQVE Alpha Adjust", {P("opacity", Type::kFloat, {100}), P("ignore_alpha", Type::kBool),
+                                                     P("invert_alpha", Type::kBool), P("mask_only", Type::kBool)}));
+    tables.push_back(Simple("KL.XQVE Black & White", {}));
+    tables.push_back(
+        Simple("TQ.XQVE Brightness & Contrast 2", {P("brightness", Type::kFloat), P("contrast", Type::kFloat)}));
+    tables.push_back(
+        Simple("KL.XQVE Color Balance", {P("red", Type::kInt, {kFullScale}), P("green", Type::kInt, {kFullScale}),
+                                         P("blue", Type::kInt, {kFullScale})}));
+    tables.push_back(Simple("KL.XQVE Color Pass",
+                            {P("similarity", Type::kInt), P("reverse", Type::kInt), P("color", Type::kColor, white)}));
+    tables.push_back(Simple("KL.XQVE Color Replace",
+                            {P("similarity", Type::kInt), P("solid_colors", Type::kInt),
+                             P("target_color", Type::kColor, black), P("replace_color", Type::kColor, black)}));
+    tables.push_back(Simple("KL.XQVE Edge Feather", {P("amount", Type::kInt)}));
+    tables.push_back(
+        Simple("KL.XQVE Extract", {P("black_input", Type::kInt), P("white_input", Type::kInt, {kFullScale}),
+                                   P("softness", Type::kInt), P("invert", Type::kBool)}));
+    tables.push_back(Simple("KL.XQVE Gamma Correction", {P("gamma", Type::kInt, {10})}));
+    tables.push_back(Simple("KL.XQVE Horizontal Flip", {}));
+    tables.push_back(Simple("KL.XQVE Vertical Flip", {}));
+    tables.push_back(
+        Simple("TQ.XQVE Noise", {P("amount", Type::kFloat), P("color", Type::kBool), P("clip", Type::kBool)}, true));
+    tables.push_back(Simple("TQ.XQVE ProcAmp", {P("brightness", Type::kFloat), P("contrast", Type::kFloat, {100}),
+                                                P("hue", Type::kFloat), P("saturation", Type::kFloat, {100}),
+                                                P("split_view", Type::kBool), P("split_percent", Type::kFloat, {50})}));
+    tables.push_back(Simple("TQ.XQVE Tint", {P("map_black", Type::kColor, black), P("map_white", Type::kColor, white),
+                                             P("amount", Type::kFloat)}));
+    tables.push_back(FastColorCorrector());
+}
+
+void AddSpatial(std::vector<EffectTable>& tables) {
+    tables.push_back(Simple("TQ.XQVE Basic 3D", {P("swivel", Type::kFloat), P("tilt", Type::kFloat),
+                                                 P("distance", Type::kFloat), P("specular_highlight", Type::kBool)}));
+    tables.push_back(Simple("TQ.XQVE Drop Shadow", {P("color", Type::kColor, {0, 0, 0, 1}), P("opacity", Type::kFloat),
+                                                    P("direction", Type::kFloat, {135}), P("distance", Type::kFloat),
+                                                    P("softness", Type::kFloat), P("shadow_only", Type::kBool)}));
+    tables.push_back(
+        Simple("TQ.XQVE TQCrop", {P("left", Type::kFloat), P("top", Type::kFloat), P("right", Type::kFloat),
+                                  P("bottom", Type::kFloat), P("zoom", Type::kBool)}));
+    tables.push_back(Simple("TQ.XQVE Motion Blur", {P("direction", Type::kFloat), P("length", Type::kFloat)}));
+    tables.push_back(Simple("TQ.XQVE Gaussian Blur 2", {P("blurriness", Type::kDouble), P("dimensions", Type::kInt),
+                                                        P("keep_size", Type::kBool)}));
+    tables.push_back(Simple("TQ.XQVE Fast Blur",
+                            {P("blurriness", Type::kFloat), P("dimensions", Type::kInt), P("keep_size", Type::kBool)}));
+    tables.push_back(Simple("TQ.XQVE Sharpen", {P("amount", Type::kInt)}));
+    tables.push_back(
+        Simple("TQ.XQVE Legacy Key Track Matte",
+               {P("matte_track", Type::kInt), P("composite_using", Type::kInt), P("reverse", Type::kBool)}));
+    tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte", 4));
+    tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte 8", 8));
+    tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte 16", 16));
+    Builder stabilizer("TQ.XQVE SubspaceStabilizer");
+    stabilizer.Row(8, "framing", Type::kInt)
+        .Rows(10, Type::kDouble, {{"largest_scale", 100}, {"margin", 0}})
+        .Row(13, "extra_scale", Type::kDouble, {100})
+        .DependsOnTime();
+    tables.push_back(stabilizer.Finish());
+}
+
+std::vector<EffectTable> MakeTables() {
+    const ParameterValue middle{0.5, 0.5};
+    std::vector<EffectTable> tables;
+    tables.push_back(Simple(
+        kMotionMatchName,
+        {P("position", Type::kPoint, middle), P("scale", Type::kFloat, {100}), P("scale_width", Type::kFloat, {100}),
+         P("uniform_scale", Type::kBool, {1}), P("rotation", Type::kFloat), P("anchor", Type::kPoint, middle)}));
+    tables.push_back(
+        Simple(kOpacityMatchName, {P("opacity", Type::kFloat, {100}), P("blend_mode", Type::kInt, {kNormalBlend})}));
+    tables.push_back(Simple("TQ.XQVE Invert", {P("channel", Type::kInt), P("blend", Type::kFloat)}));
+    AddPointwise(tables);
+    AddSpatial(tables);
+    tables.push_back(LumaCorrector());
+    tables.push_back(RgbColorCorrector());
+    tables.push_back(ThreeWayColorCorrector());
+    tables.push_back(LumaCurve());
+    tables.push_back(RgbCurves());
+    tables.push_back(Levels());
+    tables.push_back(VideoLimiter());
+    tables.push_back(UltraKey());
+    tables.push_back(Timecode());
+    return tables;
+}
+
+}  // namespace
+
+const Parameter* EffectTable::Find(const std::string& nameOrIndex) const {
+    if (nameOrIndex.empty()) return nullptr;
+    const auto found = std::find_if(parameters.begin(), parameters.end(), [&](const Parameter& parameter) {
+        return parameter.name == nameOrIndex || std::to_string(parameter.index) == nameOrIndex;
+    });
+    return found != parameters.end() ? &*found : nullptr;
+}
+
+const EffectTable* FindEffectTable(const std::string& matchName) {
+    const std::vector<EffectTable>& tables = GetEffectTables();
+    const auto found = std::find_if(tables.begin(), tables.end(),
+                                    [&](const EffectTable& table) { return table.matchName == matchName; });
+    return found != tables.end() ? &*found : nullptr;
+}
+
+const std::vector<EffectTable>& GetEffectTables() {
+    static const std::vector<EffectTable> kTables = MakeTables();
+    return kTables;
+}
+
+}  // namespace Vantrel::Host
