@@ -10,8 +10,7 @@ namespace Vantrel {
 /// One sequence as a map of render trees over time. It reads the host's segment list, keeps what didn't change, takes
 /// over trees of content that it has built before, builds the rest, and fills what lies between with black.
 ///
-/// Thread safe. Readers wait for a whole update with its host calls; GetSequenceFormat alone takes no lock, so nobody
-/// may call it during the first update.
+/// Thread safe. Readers wait for a whole update with its host calls; GetSequenceFormat alone takes no lock.
 class Timeline {
 public:
     /// The status of GetSegmentInfo for a time that no segment covers.
@@ -40,7 +39,7 @@ public:
     /// @return 0, or kStatus_NoSegment with `info` untouched.
     Status GetSegmentInfo(std::int64_t ticks, SegmentInfo& info, bool merged) const;
 
-    /// The format of the top sequence. @return 0, or kStatus_NoSequence with nothing touched. Takes no lock.
+    /// The format of the top sequence. @return 0, or kStatus_NoSequence with nothing touched. Waits for nothing.
     Status GetSequenceFormat(Vellum::Rect& rect, Vellum::PixelAspectRatio& aspect, Vellum::FrameRate& rate,
                              std::uint32_t& fieldType) const;
 

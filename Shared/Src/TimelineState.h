@@ -8,9 +8,11 @@
 #include <set>
 
 #include <boost/function.hpp>
+#include <boost/shared_ptr.hpp>
 
 #include "Ostrand/CriticalSection.h"
 #include "Shared/Src/SegmentVerdict.h"
+#include "Src/VideoNodes/VideoSegmentsHandle.h"
 
 namespace Vantrel {
 
@@ -24,8 +26,8 @@ using IsRegisteredFunction = boost::function<bool(const Halden::WideString& key)
 using SegmentMap = std::map<std::int64_t, SegmentInfo>;
 using TreeCache = std::map<Guid, SegmentVerdict>;
 
-/// What a Timeline holds, and what reading and building work on. Everything here is used under `lock`, except the four
-/// stacks, whose fronts (the format of the top sequence) GetSequenceFormat reads without it.
+/// What a Timeline holds, and what reading and building work on. Everything here is used under `lock`, except
+/// topFormat.
 struct TimelineState {
     mutable Ostrand::CriticalSection lock{"Timeline"};
     SegmentMap renderMap;  ///< the trees to render
@@ -41,6 +43,9 @@ struct TimelineState {
     std::deque<Vellum::FrameRate> mRealTimeFileFPS;
     std::deque<Vellum::PixelAspectRatio> aspectStack;
     std::deque<std::uint32_t> fieldStack;
+
+    /// The front of the four stacks for readers without the lock: through boost::atomic_load and atomic_store only.
+    boost::shared_ptr<const SequenceInfo> topFormat;
 
     RenderNodeRef blackTree;  ///< what renders where nothing lies
     std::uint32_t timelineID = 0;
