@@ -1,0 +1,214 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include "Src/Kernels/CudaDriver.h"
+
+#include <dlfcn.h>
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <map>
+#include <set>
+#include <string>
+#include <vector>
+
+#include "Kiln/Device.h"
+
+namespace Vantrel {
+namespace {
+
+constexpr std::int32_t kRequested = 4000;
+
+std::int32_t gDriverVersion = 0;
+CUresult gInitStatus = CUDA_SUCCESS;
+CUresult gVersionStatus = CUDA_SUCCESS;
+unsigned gInitFlags = 0;
+
+CUresult ScriptedInit(unsigned flags) {
+    gInitFlags = flags;
+    return gInitStatus;
+}
+CUresult ScriptedVersion(int* version) {
+    *version = gDriverVersion;
+    return gVersionStatus;
+}
+
+/// A driver library of whatever version and with whatever names are missing. Every name has an address of its own.
+class ScriptedDriver final : public DriverPlatform {
+public:
+    explicit ScriptedDriver(std::int32_t version) {
+        GetCudaDriver() = CudaDriverTable();
+        gDriverVersion = version;
+        gInitStatus = gVersionStatus = CUDA_SUCCESS;
+    }
+    ~ScriptedDriver() override { GetCudaDriver() = CudaDriverTable(); }
+
+    void* LoadLibrary(const Halden::WideString& name) override {
+        libraries.push_back(Halden::ToUTF8(name));
+        return isPresent ? this : nullptr;
+    }
+    void* GetProcAddress(void* library, const char* name) override {
+        EXPECT_EQ(library, this);
+        asked.emplace_back(name);
+        if (missing.count(name) != 0) return nullptr;
+        if (asked.back() == "cuInit") return reinterpret_cast<void*>(&ScriptedInit);
+        if (asked.back() == "cuDriverGetVersion") return reinterpret_cast<void*>(&ScriptedVersion);
+        return AddressOf(name);
+    }
+    /// What the table holds after `name` was bound.
+    void* AddressOf(const std::string& name) { return &mAddresses[name]; }
+    [[nodiscard]] bool WasAsked(const std::string& name) const {
+        return std::find(asked.begin(), asked.end(), name) != asked.end();
+    }
+    /// Loads, and returns what went to standard output.
+    std::string Load(std::int32_t requested = kRequested) {
+        ::testing::internal::CaptureStdout();
+        result = LoadCudaDriver(7, requested, *this);
+        return ::testing::internal::GetCapturedStdout();
+    }
+
+    bool isPresent = true;
+    std::set<std::string> missing;
+    std::vector<std::string> asked;
+    std::vector<std::string> libraries;
+    std::int32_t result = -1;
+
+private:
+    std::map<std::string, char> mAddresses;
+};
+
+template <class Entry>
+void* Bound(Entry entry) {
+    return reinterpret_cast<void*>(entry);
+}
+
+TEST(CudaDriver, AFullDriverBindsEverythingInOrderAndPrefersVersionedNames) {
+    ScriptedDriver driver(12000);
+    EXPECT_EQ(driver.Load(), "");
+    EXPECT_EQ(driver.result, 0);
+    EXPECT_EQ(gInitFlags, 7U);
+    EXPECT_EQ(driver.libraries, std::vector<std::string>{"nvcuda.dll"});
+    const CudaDriverTable& table = GetCudaDriver();
+    EXPECT_EQ(Bound(table.cuMemAlloc), driver.AddressOf("cuMemAlloc_v2"));
+    EXPECT_EQ(Bound(table.cuCtxDestroy), driver.AddressOf("cuCtxDestroy_v2"));
+    EXPECT_EQ(Bound(table.cuGLCtxCreate), driver.AddressOf("cuGLCtxCreate_v2"));
+    EXPECT_EQ(Bound(table.cuGraphicsResourceGetMappedPointer),
+              driver.AddressOf("cuGraphicsResourceGetMappedPointer_v2"));
+    EXPECT_EQ(Bound(table.cuParamSetv), driver.AddressOf("cuParamSetv"));
+    EXPECT_EQ(Bound(table.cuLaunchKernel), driver.AddressOf("cuLaunchKernel"));
+
+    // 2 probes, 54 base entries, 5 rebound, 40 versioned, then 6, 3, 9, 5 and 7.
+    ASSERT_EQ(driver.asked.size(), 131U);
+    const std::map<std::size_t, std::string> landmarks = {{0, "cuInit"},
+                                                          {1, "cuDriverGetVersion"},
+                                                          {2, "cuDeviceGet"},
+                                                          {55, "cuStreamDestroy"},
+                                                          {56, "cuCtxDestroy_v2"},
+                                                          {60, "cuEventDestroy_v2"},
+                                                          {61, "cuDeviceTotalMem_v2"},
+                                                          {100, "cuTexRefGetAddress_v2"},
+                                                          {101, "cuModuleLoadDataEx"},
+                                                          {107, "cuMemHostGetFlags"},
+                                                          {110, "cuMemcpyDtoDAsync"},
+                                                          {119, "cuModuleGetSurfRef"},
+                                                          {124, "cuCtxSetCurrent"},
+                                                          {130, "cuLaunchKernel"}};
+    for (const auto& [place, name] : landmarks) EXPECT_EQ(driver.asked[place], name) << place;
+}
+
+TEST(CudaDriver, TheDriversVersionDecidesWhichGroupsExist) {
+    struct Row {
+        std::int32_t version;
+        std::string last;  ///< the last name that was asked for
+        std::size_t count;
+    };
+    const Row rows[] = {{2000, "cuTexRefGetAddress_v2", 101},
+                        {2010, "cuGraphicsGLRegisterImage", 107},
+                        {2030, "cuGraphicsGLRegisterImage", 110},
+                        {3000, "cuGetExportTable", 119},
+                        {3010, "cuCtxGetLimit", 124},
+                        {3020, "cuCtxGetLimit", 124},
+                        {4000, "cuLaunchKernel", 131}};
+    for (const Row& row : rows) {
+        ScriptedDriver driver(row.version);
+        EXPECT_EQ(driver.Load(), "");
+        EXPECT_EQ(driver.result, 0) << row.version;
+        EXPECT_EQ(driver.asked.back(), row.last) << row.version;
+        EXPECT_EQ(driver.asked.size(), row.count) << row.version;
+    }
+}
+
+TEST(CudaDriver, TheRequestedVersionDecidesBetweenNames) {
+    ScriptedDriver old(4000);
+    old.Load(3010);
+    EXPECT_EQ(old.result, 0);
+    EXPECT_EQ(Bound(GetCudaDriver().cuMemAlloc), old.AddressOf("cuMemAlloc"));
+    EXPECT_EQ(Bound(GetCudaDriver().cuGLCtxCreate), old.AddressOf("cuGLCtxCreate"));
+    for (const std::string& name : old.asked) EXPECT_EQ(name.find("_v2"), std::string::npos) << name;
+
+    ScriptedDriver between(4000);
+    between.Load(3020);
+    EXPECT_EQ(Bound(GetCudaDriver().cuMemAlloc), between.AddressOf("cuMemAlloc_v2"));
+    EXPECT_EQ(Bound(GetCudaDriver().cuCtxDestroy), between.AddressOf("cuCtxDestroy"))
+        << "those five change with version 4.0 only";
+}
+
+TEST(CudaDriver, ADriverWithoutAVersionCountsAsTheOldest) {
+    ScriptedDriver driver(4000);
+    driver.missing = {"cuDriverGetVersion"};
+    EXPECT_EQ(driver.Load(), "");
+    EXPECT_EQ(driver.result, 0);
+    EXPECT_EQ(driver.asked.back(), "cuTexRefGetAddress_v2");
+    EXPECT_EQ(GetCudaDriver().cuLaunchKernel, nullptr);
+}
+
+TEST(CudaDriver, TheFirstMissingNameEndsTheLoadAndKeepsWhatWasBound) {
+    for (const std::string name : {"cuInit", "cuParamSetv", "cuStreamDestroy_v2", "cuMemAlloc_v2", "cuMemcpyPeer"}) {
+        ScriptedDriver driver(4000);
+        driver.missing = {name};
+        EXPECT_EQ(driver.Load(), "Failed to find required function \"" + name + "\" in nvcuda.dll\n");
+        EXPECT_EQ(driver.result, 999);
+        EXPECT_EQ(driver.asked.back(), name) << "nothing may be asked for after it";
+    }
+    ScriptedDriver driver(4000);
+    driver.missing = {"cuCtxDestroy_v2"};
+    driver.Load();
+    EXPECT_EQ(Bound(GetCudaDriver().cuCtxDestroy), driver.AddressOf("cuCtxDestroy"));
+    EXPECT_EQ(GetCudaDriver().cuMemAlloc, nullptr);
+}
+
+TEST(CudaDriver, FailuresToStartComeBackUnchanged) {
+    ScriptedDriver refusing(4000);
+    gInitStatus = CUDA_ERROR_NO_DEVICE;
+    EXPECT_EQ(refusing.Load(), "");
+    EXPECT_EQ(refusing.result, 100);
+    EXPECT_EQ(refusing.asked, std::vector<std::string>{"cuInit"});
+
+    ScriptedDriver mute(4000);
+    gVersionStatus = CUDA_ERROR_INVALID_VALUE;
+    EXPECT_EQ(mute.Load(), "");
+    EXPECT_EQ(mute.result, 1);
+    EXPECT_FALSE(mute.WasAsked("cuDeviceGet"));
+
+    ScriptedDriver absent(4000);
+    absent.isPresent = false;
+    EXPECT_EQ(absent.Load(), "LoadLibrary \"nvcuda.dll\" failed!\n");
+    EXPECT_EQ(absent.result, 999);
+    ::testing::internal::CaptureStdout();
+    void* library = &absent;
+    EXPECT_EQ(LoadCudaLibrary(library, absent), 999);
+    EXPECT_EQ(::testing::internal::GetCapturedStdout(), "LoadLibrary \"nvcuda.dll\" failed!\n");
+    EXPECT_EQ(library, nullptr);
+}
+
+TEST(CudaDriver, ThisMachinesDriverBindsWhole) {
+    const std::string path = Kiln::GetCudaDriverPath();
+    ASSERT_FALSE(path.empty()) << "the CPU driver is always there";
+    ASSERT_EQ(LoadCudaDriver(0, kRequested), 0);
+    int version = 0;
+    EXPECT_EQ(GetCudaDriver().cuDriverGetVersion(&version), CUDA_SUCCESS);
+    EXPECT_GE(version, 4000);
+    GetCudaDriver() = CudaDriverTable();
+}
+
+}  // namespace
+}  // namespace Vantrel
