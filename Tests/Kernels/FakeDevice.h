@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <stdexcept>
 #include <string>
 #include <vector>
 
@@ -54,6 +55,8 @@ public:
         asked.emplace_back(key);
         return module;
     }
+    std::string GetModuleMessage(const char*) override { return {}; }
+    std::uint64_t FindKernel(const char*, const char*) override { return 0; }
     const boost::shared_ptr<Halden::threads::AsyncExecutor>& GetExecutor() const override { return mExecutor; }
     void AcquireExclusiveAccess() override {}
     void ReleaseExclusiveAccess() override {}

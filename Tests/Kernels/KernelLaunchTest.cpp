@@ -7,6 +7,7 @@
 #include <cstring>
 #include <vector>
 
+#include "Kiln/Frames.h"
 #include "Src/Kernels/CudaDriver.h"
 #include "Src/Kernels/KernelTable.h"
 #include "Src/Kernels/OpenCLLibrary.h"
