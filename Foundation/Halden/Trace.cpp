@@ -50,7 +50,7 @@ void Trace(const std::string& line) {
     if (state.sink) {
         state.sink(line);
     } else {
-        std::fprintf(stderr, "%s\n", line.c_str());
+        (void)std::fprintf(stderr, "%s\n", line.c_str());
     }
 }
 

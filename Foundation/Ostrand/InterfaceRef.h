@@ -17,15 +17,16 @@ template <class T>
 class InterfaceRef {
 public:
     InterfaceRef() = default;
-    InterfaceRef(std::nullptr_t) {}
+    InterfaceRef(std::nullptr_t) {}  // NOLINT(google-explicit-constructor): null converts as for any pointer
     /// Shares an object: counts up.
     explicit InterfaceRef(T* object) : mObject(object) { AddRefIfHeld(); }
     InterfaceRef(const InterfaceRef& other) : mObject(other.mObject) { AddRefIfHeld(); }
     InterfaceRef(InterfaceRef&& other) noexcept : mObject(std::exchange(other.mObject, nullptr)) {}
 
-    /// From a derived class: an ordinary upcast.
+    /// From a derived class: an ordinary upcast, hence implicit.
     template <class U, class = std::enable_if_t<std::is_convertible_v<U*, T*>>>
-    InterfaceRef(const InterfaceRef<U>& other) : mObject(other.Get()) {
+    InterfaceRef(const InterfaceRef<U>& other)  // NOLINT(google-explicit-constructor)
+        : mObject(other.Get()) {
         AddRefIfHeld();
     }
 
@@ -56,7 +57,7 @@ public:
     friend bool operator<(const InterfaceRef& a, const InterfaceRef& b) { return a.mObject < b.mObject; }
 
 private:
-    T& Demand() const {
+    [[nodiscard]] T& Demand() const {
         if (!mObject) throw NullInterfaceException();
         return *mObject;
     }

@@ -68,7 +68,7 @@ std::string ToText(PixelFormat format) {
                                      [format](const NamedFormat& entry) { return entry.format == format; });
     if (known != std::end(kFormats)) return known->name;
     char text[2 + 16 + 1];
-    std::snprintf(text, sizeof text, "0x%016llX", static_cast<unsigned long long>(format.GetValue()));
+    (void)std::snprintf(text, sizeof text, "0x%016llX", static_cast<unsigned long long>(format.GetValue()));
     return text;
 }
 
