@@ -160,6 +160,7 @@ void VideoFile::SeekBefore(std::int64_t number) {
     mAtEnd = false;
     mLast.reset();
     mLastNumber = -1;
+    mRecent.clear();
 }
 
 void VideoFile::FeedDecoder() {
@@ -190,11 +191,13 @@ bool VideoFile::DecodeNext() {
             mAtEnd = true;
             break;
         }
-        std::int64_t pts = mDecoded->best_effort_timestamp;
+        const std::int64_t pts = mDecoded->best_effort_timestamp;
         const std::int64_t number = pts == AV_NOPTS_VALUE ? mLastNumber + 1 : NumberOf(pts);
         mLast = ShareFrame(*mDecoded);
         av_frame_unref(mDecoded.get());
         mLastNumber = number;
+        mRecent.emplace_back(number, ShareFrame(*mLast));
+        if (mRecent.size() > kRecentFrames) mRecent.pop_front();
         return true;
     }
     return false;
@@ -202,7 +205,9 @@ bool VideoFile::DecodeNext() {
 
 Frame VideoFile::ReadFrame(std::int64_t number) {
     number = std::clamp<std::int64_t>(number, 0, mInfo.frameCount - 1);
-    if (mLast && mLastNumber == number) return ShareFrame(*mLast);
+    for (const auto& [recentNumber, frame] : mRecent) {
+        if (recentNumber == number) return ShareFrame(*frame);
+    }
     const bool runOn = mLast ? number > mLastNumber && number - mLastNumber <= kRunForwardFrames
                              : number <= kRunForwardFrames && !mAtEnd;
     if (!runOn) SeekBefore(number);

@@ -3,8 +3,10 @@
 #pragma once
 
 #include <cstdint>
+#include <deque>
 #include <optional>
 #include <string>
+#include <utility>
 #include <vector>
 
 #include "Host/Media/FFmpegHandles.h"
@@ -43,8 +45,11 @@ public:
     /// The picture of frame `number`, or the nearest one that the file has. Throws MediaError when it has none there.
     [[nodiscard]] Frame ReadFrame(std::int64_t number);
 
-    /// The number of the frame that was read last, -1 before the first: reading on from here needs no seek.
+    /// The number of the frame that was decoded last, -1 before the first: reading on from here needs no seek.
     [[nodiscard]] std::int64_t GetPosition() const { return mLast ? mLastNumber : -1; }
+
+    /// How many frames before its position a file still has at hand: threads that share one ask a little out of order.
+    static constexpr std::int64_t kRecentFrames = 8;
 
 private:
     void OpenStream(int threads);
@@ -71,6 +76,7 @@ private:
     Frame mDecoded = MakeFrame();
     Frame mLast;
     std::int64_t mLastNumber = -1;
+    std::deque<std::pair<std::int64_t, Frame>> mRecent;
 };
 
 }  // namespace Vantrel::Host

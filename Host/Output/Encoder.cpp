@@ -117,7 +117,10 @@ void Encoder::ConvertFloat(const HostPicture& picture) {
         for (int channel = 0; channel < planes; ++channel) {
             auto* plane = reinterpret_cast<float*>(
                 mFrame->data[kPlaneOf[channel]] + static_cast<std::ptrdiff_t>(mFrame->linesize[kPlaneOf[channel]]) * y);
-            for (std::int32_t x = 0; x < picture.width; ++x) plane[x] = row[4 * x + channel];
+            const bool weighted = planes == 4 && channel < 3;
+            for (std::int32_t x = 0; x < picture.width; ++x) {
+                plane[x] = row[4 * x + channel] * (weighted ? row[4 * x + 3] : 1.0F);
+            }
         }
     }
 }
