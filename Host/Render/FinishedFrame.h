@@ -1,0 +1,33 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include "Host/Media/HostPicture.h"
+#include "Kiln/Frames.h"
+
+namespace Vantrel::Host {
+
+/// Brings a finished frame of the engine into host memory: a device frame is read back, a host frame is taken as it is
+/// and converted where its format differs.
+/// @param format BGRA_4444_8u or BGRA_4444_32f.
+/// Called under the device's exclusive access. Empty when the device can't give the frame back.
+[[nodiscard]] std::shared_ptr<HostPicture> TakeFinishedFrame(PixelBufferPool& pool, const Marl::VideoFrameRef& frame,
+                                                             Vellum::PixelFormat format);
+
+/// Lays a picture over opaque black, in place.
+void LayOverBlack(HostPicture& picture);
+
+/// Puts the lines of the field that comes second in time from `second` into `first`. Both have the same size and
+/// format.
+void WeaveFields(HostPicture& first, const HostPicture& second, std::uint32_t fieldType);
+
+/// A picture of transparent black.
+[[nodiscard]] std::shared_ptr<HostPicture> MakeTransparentPicture(PixelBufferPool& pool, Vellum::PixelFormat format,
+                                                                  std::int32_t width, std::int32_t height);
+
+/// Converts between BGRA of 8 bits and of 32-bit float; the same format comes back unchanged. Values are rounded and
+/// clamped for 8 bits. Throws std::invalid_argument for other formats.
+[[nodiscard]] HostPictureRef ConvertPicture(PixelBufferPool& pool, const HostPictureRef& picture,
+                                            Vellum::PixelFormat format);
+
+}  // namespace Vantrel::Host

@@ -1,0 +1,188 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include "Host/Render/FrameLoop.h"
+
+#include <numeric>
+#include <stdexcept>
+
+#include <boost/make_shared.hpp>
+
+#include "Host/Render/FinishedFrame.h"
+
+namespace Vantrel::Host {
+
+namespace {
+
+using Clock = std::chrono::steady_clock;
+
+double SecondsSince(Clock::time_point start) { return std::chrono::duration<double>(Clock::now() - start).count(); }
+
+/// The aspect of output pixels that show a sequence's picture in another size.
+Vellum::PixelAspectRatio ScaleAspect(Vellum::PixelAspectRatio aspect, const Vellum::Rect& sequence, std::int32_t width,
+                                     std::int32_t height) {
+    const std::int64_t numerator = std::int64_t{aspect.numerator} * sequence.Width() * height;
+    const std::int64_t denominator = std::int64_t{aspect.denominator} * sequence.Height() * width;
+    const std::int64_t divisor = std::gcd(numerator, denominator);
+    if (divisor == 0 || numerator / divisor > INT32_MAX || denominator / divisor > INT32_MAX) return aspect;
+    return {static_cast<std::int32_t>(numerator / divisor), static_cast<std::int32_t>(denominator / divisor)};
+}
+
+}  // namespace
+
+/// A frame on its way: everything that the engine was given for it, and the sign that its host pictures are there.
+struct FrameLoop::Request {
+    std::int64_t number = 0;
+    SegmentInfo info;
+    boost::shared_ptr<RenderParams> params;
+    RenderResultsRef results;
+    bool refused = false;  ///< the host refused a picture: nothing will complete
+
+    std::mutex mutex;
+    std::condition_variable changed;
+    bool prepared = false;
+};
+
+FrameLoop::FrameLoop(boost::shared_ptr<RenderSystem> system, std::shared_ptr<PixelBufferPool> pool,
+                     HostRenderer hostRenderer)
+    : mSystem(std::move(system)), mPool(std::move(pool)), mHostRenderer(std::move(hostRenderer)) {
+    if (mSystem->GetSequenceFormat(mSequenceRect, mAspect, mRate, mFieldType) != 0) {
+        throw std::runtime_error("the engine could not read the sequence");
+    }
+}
+
+FrameLoop::~FrameLoop() { Abandon(); }
+
+RenderParams FrameLoop::MakeParams(const RenderJob& job, std::int64_t time, const SegmentInfo& info) const {
+    RenderParams params;
+    params.time = time;
+    params.clipTime = time - info.in + info.offset;
+    params.outputRect = {0, 0, job.width, job.height};
+    params.pixelAspectRatio = ScaleAspect(mAspect, mSequenceRect, job.width, job.height);
+    params.pixelFormat = Vellum::FourCC("bgra");
+    params.fieldType = mFieldType;
+    params.fieldSelection = Vellum::kFieldSelection_Frame;
+    params.quality = job.quality;
+    params.frameTicks = mRate.GetTicksPerFrame();
+    params.collectInformation = job.report ? 1 : 0;
+    params.sequenceID = job.timelineID;
+    params.sequenceFieldType = mFieldType;
+    params.sequenceFrameTicks = mRate.GetTicksPerFrame();
+    params.sequenceRect = mSequenceRect;
+    params.scaleX = static_cast<float>(mSequenceRect.Width()) / static_cast<float>(job.width);
+    params.scaleY = static_cast<float>(mSequenceRect.Height()) / static_cast<float>(job.height);
+    return params;
+}
+
+void FrameLoop::Prepare(const RenderJob& job, std::int64_t number) {
+    auto request = std::make_shared<Request>();
+    request->number = number;
+    const std::int64_t time = number * mRate.GetTicksPerFrame();
+    if (mSystem->GetSegmentInfo(time, request->info, false) != 0) request->info = SegmentInfo();
+    request->params = boost::make_shared<RenderParams>(MakeParams(job, time, request->info));
+    const std::weak_ptr<Request> weak = request;
+    request->results = boost::make_shared<RenderResults>([weak] {
+        const std::shared_ptr<Request> done = weak.lock();
+        if (!done) return;
+        const std::lock_guard<std::mutex> hold(done->mutex);
+        done->prepared = true;
+        done->changed.notify_all();
+    });
+    mAhead.push_back(request);
+    const RenderNodeRef& root = request->info.tree;
+    if (!root) {
+        request->prepared = true;
+        return;
+    }
+    if (root->CollectHostFrames(*request->params, request->results, mPrevious) != 0 &&
+        Ostrand::Failed(root->RequestHostFrames(*request->params, request->results))) {
+        request->refused = true;
+        return;
+    }
+    mSystem->PrepareRender(root, request->params, request->results);
+}
+
+void FrameLoop::WaitUntilPrepared(Request& request, RenderSummary& summary) {
+    std::unique_lock<std::mutex> lock(request.mutex);
+    if (request.prepared || request.refused) return;
+    const Clock::time_point start = Clock::now();
+    request.changed.wait(lock, [&request] { return request.prepared; });
+    summary.waitSeconds += SecondsSince(start);
+}
+
+std::shared_ptr<HostPicture> FrameLoop::RenderOnDevice(const RenderJob& job, Request& request, std::string& report) {
+    const Kiln::ScopedDeviceAccess hold(mSystem->GetDevice());
+    VideoFrameRef first;
+    VideoFrameRef second;
+    const Status status = mSystem->RenderFrames(request.info.tree, request.params, request.results, first, second,
+                                                job.report ? &report : nullptr, request.params->outputRect);
+    if (Ostrand::Failed(status)) return nullptr;
+    if (!first) return MakeTransparentPicture(*mPool, job.format, job.width, job.height);
+    std::shared_ptr<HostPicture> picture = TakeFinishedFrame(*mPool, first, job.format);
+    if (!picture || !second) return picture;
+    const std::shared_ptr<HostPicture> other = TakeFinishedFrame(*mPool, second, job.format);
+    if (!other) return nullptr;
+    WeaveFields(*picture, *other, mFieldType);
+    return picture;
+}
+
+RenderedFrame FrameLoop::RenderNext(const RenderJob& job, RenderSummary& summary) {
+    const std::shared_ptr<Request> request = mAhead.front();
+    mAhead.pop_front();
+    RenderedFrame frame;
+    frame.number = request->number;
+    WaitUntilPrepared(*request, summary);
+    const bool onDevice = request->info.tree && !request->refused;
+    if (onDevice) frame.picture = RenderOnDevice(job, *request, frame.report);
+    ++summary.frames;
+    if (frame.picture) {
+        ++(request->info.hostWhole  ? summary.hostFrames
+           : request->info.hostPart ? summary.partlyHostFrames
+                                    : summary.deviceFrames);
+    } else {
+        // What the device can't give, the host's own renderer gives.
+        const HostPictureRef picture = mHostRenderer(*request->params);
+        if (!picture) {
+            throw std::runtime_error("frame " + std::to_string(request->number) +
+                                     " could be rendered neither on the device nor by the host");
+        }
+        frame.picture = std::make_shared<HostPicture>(*ConvertPicture(*mPool, picture, job.format));
+        ++summary.hostFrames;
+        ++summary.failedFrames;
+    }
+    mPrevious = request->results;
+    return frame;
+}
+
+void FrameLoop::Abandon() {
+    for (const std::shared_ptr<Request>& request : mAhead) {
+        if (request->info.tree) request->info.tree->CancelHostFrames(*request->params, request->results);
+    }
+    RenderSummary unused;
+    for (const std::shared_ptr<Request>& request : mAhead) WaitUntilPrepared(*request, unused);
+    mAhead.clear();
+    mPrevious.reset();
+    mSystem->GetDevice()->GetExecutor()->Drain();
+}
+
+RenderSummary FrameLoop::Run(const RenderJob& job, const Sink& sink, const std::atomic<bool>& stop) {
+    RenderSummary summary;
+    const Clock::time_point start = Clock::now();
+    std::int64_t next = job.firstFrame;
+    while (next < job.endFrame || !mAhead.empty()) {
+        if (stop) {
+            summary.stopped = true;
+            Abandon();
+            break;
+        }
+        while (next < job.endFrame && mAhead.size() <= static_cast<std::size_t>(job.framesAhead)) Prepare(job, next++);
+        RenderedFrame frame = RenderNext(job, summary);
+        summary.peakDeviceBytes =
+            std::max(summary.peakDeviceBytes, mSystem->GetDevice()->GetDeviceMemory()->GetStatistics().peakBytesInUse);
+        if (!job.alpha) LayOverBlack(*frame.picture);
+        sink(std::move(frame));
+    }
+    summary.seconds = SecondsSince(start);
+    return summary;
+}
+
+}  // namespace Vantrel::Host
