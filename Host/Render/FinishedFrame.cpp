@@ -110,10 +110,9 @@ std::shared_ptr<HostPicture> MakeTransparentPicture(PixelBufferPool& pool, Vellu
     return picture;
 }
 
-void WeaveFields(HostPicture& first, const HostPicture& second, std::uint32_t fieldType) {
-    const std::int32_t start = fieldType == Vellum::kFieldType_LowerFirst ? 0 : 1;
-    const std::size_t bytes = static_cast<std::size_t>(first.width) * Vellum::BytesPerPixel(first.format);
-    for (std::int32_t y = start; y < first.height; y += 2) std::memcpy(first.GetRow(y), second.GetRow(y), bytes);
+void WeaveFields(HostPicture& upper, const HostPicture& lower) {
+    const std::size_t bytes = static_cast<std::size_t>(upper.width) * Vellum::BytesPerPixel(upper.format);
+    for (std::int32_t y = 1; y < upper.height; y += 2) std::memcpy(upper.GetRow(y), lower.GetRow(y), bytes);
 }
 
 void LayOverBlack(HostPicture& picture) {

@@ -121,7 +121,8 @@ std::shared_ptr<HostPicture> FrameLoop::RenderOnDevice(const RenderJob& job, Req
     if (!picture || !second) return picture;
     const std::shared_ptr<HostPicture> other = TakeFinishedFrame(*mPool, second, job.format);
     if (!other) return nullptr;
-    WeaveFields(*picture, *other, mFieldType);
+    // Whatever their order in time, the engine hands the upper field's frame out first.
+    WeaveFields(*picture, *other);
     return picture;
 }
 
