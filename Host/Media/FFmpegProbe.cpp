@@ -10,7 +10,7 @@
 #include <map>
 #include <mutex>
 
-#include "Host/Media/FilterSource.h"
+#include "Host/Media/FilterSourceReader.h"
 #include "Host/Media/PictureConverter.h"
 #include "Host/Media/VideoFile.h"
 #include "Host/Time/ExactTime.h"
@@ -107,7 +107,7 @@ MediaProbeResult FFmpegProbe::ProbeFilterSource(const std::string& source, std::
     try {
         AVRational rate{};
         av_reduce(&rate.num, &rate.den, Vellum::kTicksPerSecond, ticksPerFrame, INT32_MAX);
-        const FilterSource filter(source, width, height, rate);
+        const FilterSourceReader filter(source, width, height, rate);
         MediaInfo info;
         SetPicture(info, filter.GetWidth(), filter.GetHeight(), filter.GetSampleAspect(), 0);
         info.ticksPerFrame = SnappedTicks(filter.GetFrameRate());

@@ -16,11 +16,11 @@ namespace Vantrel::Host {
 
 /// Pictures from one of libavfilter's sources ("testsrc2", "smptebars=duration=1"), read by number. Used by one thread
 /// at a time.
-class FilterSource {
+class FilterSourceReader {
 public:
     /// Options that the text leaves open are set to the size and rate given, where the filter has them. Throws
     /// MediaError for a name that isn't a source of pictures, and for options that it refuses.
-    FilterSource(const std::string& source, std::int32_t width, std::int32_t height, AVRational rate);
+    FilterSourceReader(const std::string& source, std::int32_t width, std::int32_t height, AVRational rate);
 
     [[nodiscard]] std::int32_t GetWidth() const;
     [[nodiscard]] std::int32_t GetHeight() const;

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include "Host/Media/FilterSource.h"
+#include "Host/Media/FilterSourceReader.h"
 
 extern "C" {
 #include <libavfilter/buffersink.h>
@@ -20,12 +20,12 @@ bool LeavesOpen(const AVFilter& filter, const std::string& text, const char* opt
 
 }  // namespace
 
-FilterSource::FilterSource(const std::string& source, std::int32_t width, std::int32_t height, AVRational rate)
+FilterSourceReader::FilterSourceReader(const std::string& source, std::int32_t width, std::int32_t height, AVRational rate)
     : mSource(source), mWidth(width), mHeight(height), mRate(rate) {
     Start();
 }
 
-void FilterSource::Start() {
+void FilterSourceReader::Start() {
     const std::size_t split = mSource.find('=');
     const std::string name = mSource.substr(0, split);
     std::string options = split == std::string::npos ? std::string() : mSource.substr(split + 1);
@@ -55,20 +55,20 @@ void FilterSource::Start() {
     mNext = 0;
 }
 
-std::int32_t FilterSource::GetWidth() const { return av_buffersink_get_w(mSink); }
+std::int32_t FilterSourceReader::GetWidth() const { return av_buffersink_get_w(mSink); }
 
-std::int32_t FilterSource::GetHeight() const { return av_buffersink_get_h(mSink); }
+std::int32_t FilterSourceReader::GetHeight() const { return av_buffersink_get_h(mSink); }
 
-AVRational FilterSource::GetSampleAspect() const {
+AVRational FilterSourceReader::GetSampleAspect() const {
     const AVRational aspect = av_buffersink_get_sample_aspect_ratio(mSink);
     return aspect.num > 0 && aspect.den > 0 ? aspect : AVRational{1, 1};
 }
 
-AVRational FilterSource::GetFrameRate() const { return av_buffersink_get_frame_rate(mSink); }
+AVRational FilterSourceReader::GetFrameRate() const { return av_buffersink_get_frame_rate(mSink); }
 
-int FilterSource::GetPixelFormat() const { return av_buffersink_get_format(mSink); }
+int FilterSourceReader::GetPixelFormat() const { return av_buffersink_get_format(mSink); }
 
-Frame FilterSource::ReadFrame(std::int64_t number) {
+Frame FilterSourceReader::ReadFrame(std::int64_t number) {
     if (number < 0) number = 0;
     if (number < mNext - 1) Start();
     while (mNext <= number) {
