@@ -2,6 +2,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <string>
+#include <vector>
+
 #include "Host/Media/HostPicture.h"
 #include "Host/Snapshot/Node.h"
 #include "Vantrel/HostSuites.h"
@@ -39,6 +42,9 @@ public:
     [[nodiscard]] virtual HostPictureRef RenderOperators(const Node& clip, std::int32_t endOperator,
                                                          std::int64_t rawTime, const SequenceSize& sequence,
                                                          const VantrelRenderDescription& description) = 0;
+
+    /// Match names of effects that have no software version: their pictures passed through unchanged. Sorted.
+    [[nodiscard]] virtual std::vector<std::string> GetPassedThrough() const = 0;
 };
 
 }  // namespace Vantrel::Host
