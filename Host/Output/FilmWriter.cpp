@@ -52,6 +52,7 @@ FilmWriter::FilmWriter(const OutputFormat& format) : mFile(format.path) {
     mStream->time_base = mTimeBase;
     mStream->avg_frame_rate = rate;
     mStream->sample_aspect_ratio = context.sample_aspect_ratio;
+    if (!format.timecode.empty()) av_dict_set(&output->metadata, "timecode", format.timecode.c_str(), 0);
     Demand(avio_open(&output->pb, mFile.GetWorkingPath().c_str(), AVIO_FLAG_WRITE), "can't be written");
     AVDictionary* options = nullptr;
     av_dict_set(&options, "movflags", "+faststart", 0);

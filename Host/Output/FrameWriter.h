@@ -30,6 +30,8 @@ struct OutputFormat {
     std::uint32_t fieldType = Vellum::kFieldType_Progressive;
     /// Keep the alpha channel. Only pictures can.
     bool alpha = false;
+    /// Of the first frame, "HH:MM:SS:FF"; empty for none. Only MP4 and MOV films keep it.
+    std::string timecode;
 };
 
 /// Writes finished pictures in order. Nothing stands under the final name before the file is whole: what was begun and
