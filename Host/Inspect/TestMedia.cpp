@@ -29,11 +29,20 @@ std::string FileNameOf(const Item& clip) {
                                                                              : path.filename().string() + ".mov";
 }
 
-void Collect(const Item& item, std::map<std::string, TestMediaPlan>& plans) {
-    for (const Item& child : item.children) Collect(child, plans);
+/// The frame length of the first item that has one: what clips go by that are used whole.
+std::int64_t FirstFrameTicks(const Item& item) {
+    if (item.sourceFrameTicks > 0) return item.sourceFrameTicks;
+    for (const Item& child : item.children) {
+        if (const std::int64_t ticks = FirstFrameTicks(child); ticks > 0) return ticks;
+    }
+    return 0;
+}
+
+void Collect(const Item& item, std::int64_t defaultTicks, std::map<std::string, TestMediaPlan>& plans) {
+    for (const Item& child : item.children) Collect(child, defaultTicks, plans);
     if (item.kind != ItemKind::kClip) return;
     const std::string name = FileNameOf(item);
-    const std::int64_t ticks = item.sourceFrameTicks;
+    const std::int64_t ticks = item.sourceFrameTicks > 0 ? item.sourceFrameTicks : defaultTicks;
     if (name.empty() || ticks <= 0) return;
     TimeRange range{0, kDefaultFrames * ticks};
     if (item.media.availableRange) {
@@ -53,8 +62,8 @@ void Collect(const Item& item, std::map<std::string, TestMediaPlan>& plans) {
 }
 
 std::string TimecodeOf(std::int64_t frame, std::int64_t ticksPerFrame) {
-    const auto rate =
-        static_cast<std::int64_t>(std::llround(static_cast<double>(Vellum::kTicksPerSecond) / ticksPerFrame));
+    const auto rate = static_cast<std::int64_t>(
+        std::llround(static_cast<double>(Vellum::kTicksPerSecond) / static_cast<double>(ticksPerFrame)));
     char text[48];
     std::snprintf(text, sizeof text, "%02lld:%02lld:%02lld:%02lld", static_cast<long long>(frame / rate / 3600),
                   static_cast<long long>(frame / rate / 60 % 60), static_cast<long long>(frame / rate % 60),
@@ -66,7 +75,7 @@ std::string TimecodeOf(std::int64_t frame, std::int64_t ticksPerFrame) {
 
 std::vector<TestMediaPlan> PlanTestMedia(const Document& document) {
     std::map<std::string, TestMediaPlan> plans;
-    Collect(document.tracks, plans);
+    Collect(document.tracks, FirstFrameTicks(document.tracks), plans);
     std::vector<TestMediaPlan> result;
     for (const auto& [name, plan] : plans) result.push_back(plan);
     return result;
