@@ -17,9 +17,8 @@ namespace Vantrel::Host {
 /// Lays a picture over opaque black, in place.
 void LayOverBlack(HostPicture& picture);
 
-/// Puts the lines of the field that comes second in time from `second` into `first`. Both have the same size and
-/// format.
-void WeaveFields(HostPicture& first, const HostPicture& second, std::uint32_t fieldType);
+/// Puts the lower field's lines (1, 3, ...) of `lower` into `upper`. Both have the same size and format.
+void WeaveFields(HostPicture& upper, const HostPicture& lower);
 
 /// A picture of transparent black.
 [[nodiscard]] std::shared_ptr<HostPicture> MakeTransparentPicture(PixelBufferPool& pool, Vellum::PixelFormat format,
