@@ -88,7 +88,15 @@ std::uint64_t MemoryPool::TryAllocate(std::uint64_t bytes) {
 }
 
 bool MemoryPool::GiveUpSomething(std::uint64_t bytes) {
-    return ReleaseUnused(kAll - 1) > 0 || AwaitMarks() || mCache.Purge(bytes) > 0;
+    if (ReleaseUnused(kAll - 1) > 0 || AwaitMarks()) return true;
+    // Within the limit it was the system that refused, and nobody knows how much it lacks.
+    std::uint64_t missing = bytes;
+    {
+        const std::lock_guard<std::mutex> lock(mMutex);
+        const std::uint64_t room = mFigures.hardLimit - std::min(mFigures.hardLimit, mFigures.bytesInUse);
+        if (room < bytes) missing = bytes - room;
+    }
+    return mCache.Purge(missing) > 0;
 }
 
 void MemoryPool::Free(std::uint64_t block, const TimingMarkRef& lastUse) {
