@@ -83,4 +83,81 @@ private:
 
 using RenderResultsRef = boost::shared_ptr<RenderResults>;
 
+// Written here because a host links three functions of the engine and nothing else. The lock is held for the
+// container's work only.
+
+inline VideoFrameRef RenderResults::FindFrame(const Guid& hash) const {
+    const Ostrand::ScopedLock lock(mLock);
+    const auto found = mFrames.find(hash);
+    return found == mFrames.end() ? VideoFrameRef() : found->second;
+}
+
+inline void RenderResults::StoreFrame(const Guid& hash, const VideoFrameRef& frame) {
+    const Ostrand::ScopedLock lock(mLock);
+    mFrames.emplace(hash, frame);
+}
+
+inline void RenderResults::RemoveFrame(const Guid& hash) {
+    VideoFrameRef last;  // ends behind the lock: a frame's end may be long
+    const Ostrand::ScopedLock lock(mLock);
+    const auto found = mFrames.find(hash);
+    if (found == mFrames.end()) return;
+    last.Swap(found->second);
+    mFrames.erase(found);
+}
+
+inline Status RenderResults::FindPendingRequest(const Guid& hash, std::uint32_t& id) const {
+    const auto found = mPendingRequests.find(hash);
+    if (found == mPendingRequests.end() || found->second == 0) return kStatus_NoRequest;
+    id = found->second;
+    return Ostrand::kStatus_OK;
+}
+
+inline void RenderResults::AddPendingRequest(const Guid& hash, std::uint32_t id) { mPendingRequests[hash] = id; }
+
+inline bool RenderResults::FindHash(const IRenderNode* node, std::int64_t time, Guid& hash) const {
+    const Ostrand::ScopedLock lock(mLock);
+    const auto found = mHashes.find({node, time});
+    if (found == mHashes.end()) return false;
+    hash = found->second;
+    return true;
+}
+
+inline void RenderResults::StoreHash(const IRenderNode* node, std::int64_t time, const Guid& hash) {
+    const Ostrand::ScopedLock lock(mLock);
+    mHashes[{node, time}] = hash;
+}
+
+inline void RenderResults::AppendLog(const Guid& hash, const std::string& text) {
+    const Ostrand::ScopedLock lock(mLock);
+    if (mLoggedFrames.insert(hash).second) mLog.insert(0, text);
+}
+
+inline std::string RenderResults::GetLog() const {
+    const Ostrand::ScopedLock lock(mLock);
+    return mLog;
+}
+
+inline VideoFrameRef RenderResults::GetSelectedFrame() const {
+    const Ostrand::ScopedLock lock(mLock);
+    return mSelectedFrame;
+}
+
+inline void RenderResults::SetSelectedFrame(const VideoFrameRef& frame) {
+    VideoFrameRef selected(frame);
+    const Ostrand::ScopedLock lock(mLock);
+    mSelectedFrame.Swap(selected);
+}
+
+inline void RenderResults::BeginAsyncPiece() {
+    if (mCompletion) ++mOutstanding;
+}
+
+inline void RenderResults::EndAsyncPiece() {
+    if (!mCompletion || --mOutstanding != 0) return;
+    boost::function<void()> completion;
+    completion.swap(mCompletion);
+    completion();
+}
+
 }  // namespace Vantrel

@@ -1,0 +1,135 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include "Src/Nodes/NodeRegistry.h"
+
+#include <array>
+#include <map>
+#include <string>
+
+#include "Halden/DebugDatabase.h"
+#include "Src/Filters/DisabledNode.h"
+#include "Src/Filters/Synthetics/SolidColorNode.h"
+#include "Src/VideoNodes/VideoMediaNode.h"
+
+namespace Vantrel {
+namespace {
+
+using Kiln::DeviceFramework;
+using Creator = RenderNodeRef (*)();
+
+template <class Node>
+RenderNodeRef Make() {
+    return RenderNodeRef(new Node);
+}
+
+struct RegistryEntry {
+    const char16_t* key;
+    Creator creator;
+    bool cudaOnly = false;
+};
+
+/// Every node that a name can stand for. Structure first, then effects, transitions and synthetic media.
+constexpr RegistryEntry kEntries[] = {
+    {u"BlackVideoSource", Make<SolidColorNode>},
+    {u"DisabledNode", Make<DisabledNode>},
+};
+
+constexpr const char16_t* kHostRenderClipKey = u"HostRenderClip";
+constexpr const char16_t* kHostRenderSubtreeKey = u"HostRenderSubtree";
+constexpr const char16_t* kHostRenderSourceKey = u"HostRenderSource";
+constexpr const char16_t* kBlackVideoSourceKey = u"BlackVideoSource";
+constexpr const char16_t* kMotionKey = u"TQ.XQVE Motion";
+
+using Registry = std::map<WideString, Creator>;
+
+Registry& RegistryOf(DeviceFramework framework) {
+    static std::array<Registry, 2> registries;
+    return registries[static_cast<std::size_t>(framework)];
+}
+
+/// Exactly one framework's names reach Kiln: those of the framework that will render.
+bool NamesItsKeys(DeviceFramework framework) {
+    const bool openclOnly = Kiln::GetPrimaryDevice(DeviceFramework::kOpenCL) != nullptr &&
+                            Kiln::GetPrimaryDevice(DeviceFramework::kCuda) == nullptr;
+    return openclOnly == (framework == DeviceFramework::kOpenCL);
+}
+
+/// A setting for tests and support: media then comes from the host like everything else that has no node.
+bool IsMediaNodeDisabled() {
+    return Halden::debug::DebugDatabase::Instance().GetEntry(u"DisableGPUMediaNode", u"false") == u"true";
+}
+
+void FillRegistry(DeviceFramework framework) {
+    Registry& registry = RegistryOf(framework);
+    const bool naming = NamesItsKeys(framework);
+    for (const RegistryEntry& entry : kEntries) {
+        if (entry.cudaOnly && framework != DeviceFramework::kCuda) continue;
+        const WideString key = entry.key;
+        if (key == kHostRenderClipKey && IsMediaNodeDisabled()) continue;
+        if (naming) Kiln::RegisterMatchName(key);
+        registry.emplace(key, entry.creator);
+    }
+}
+
+RenderNodeRef MakeByKey(const WideString& key, const Kiln::DeviceRef& device, const VideoNodeRef& description,
+                        const RenderRequirements& requirements, bool& host) {
+    const Registry& registry = RegistryOf(device->GetFramework());
+    const auto found = registry.find(key);
+    if (found == registry.end()) return {};
+    RenderNodeRef node = found->second();
+    if (Ostrand::Failed(node->Configure(description, requirements, host))) {
+        host = true;
+        node.Reset();
+    }
+    return node;
+}
+
+/// Would the frames that a node may hold at once go beyond what the device allows?
+bool IsOversized(const Vellum::Rect& rect, const Kiln::Device& device) {
+    constexpr std::uint32_t kLargestPixel = 16;
+    constexpr std::uint64_t kFramesOfANode = 4;
+    const auto bytes = static_cast<std::int32_t>(static_cast<std::uint32_t>(rect.Width()) *
+                                                 static_cast<std::uint32_t>(rect.Height()) * kLargestPixel);
+    // A product beyond 31 bits is negative and, widened, larger than any limit.
+    return static_cast<std::uint64_t>(std::int64_t{bytes}) * kFramesOfANode > device.GetMemoryLimit();
+}
+
+}  // namespace
+
+void FillCudaRegistry() { FillRegistry(DeviceFramework::kCuda); }
+
+void FillOpenCLRegistry() { FillRegistry(DeviceFramework::kOpenCL); }
+
+bool isRegistered(const WideString& key, const Kiln::DeviceRef& device) {
+    return RegistryOf(device->GetFramework()).count(key) != 0;
+}
+
+RenderNodeRef createNode(const WideString& key, const Kiln::DeviceRef& device, const VideoNodeRef& description,
+                         const RenderRequirements& requirements, bool& host) {
+    if (key != kHostRenderSourceKey && key != kBlackVideoSourceKey && IsOversized(requirements.frameRect, *device)) {
+        host = true;
+        return {};
+    }
+    const bool hostBefore = host;
+    RenderNodeRef node = MakeByKey(key, device, description, requirements, host);
+    if (!node) {
+        if (const auto* media = dynamic_cast<const VideoMediaNode*>(description.get())) {
+            host = hostBefore;
+            node = MakeByKey(media->GetMediaInstanceString(), device, description, requirements, host);
+        }
+    }
+    if (!node) {
+        host = hostBefore;
+        node = MakeByKey(kHostRenderSubtreeKey, device, description, requirements, host);
+    }
+    return node;
+}
+
+RenderNodeRef MakeIntrinsicNode() {
+    for (const RegistryEntry& entry : kEntries) {
+        if (WideString(entry.key) == kMotionKey) return entry.creator();
+    }
+    return {};
+}
+
+}  // namespace Vantrel

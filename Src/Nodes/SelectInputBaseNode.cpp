@@ -1,0 +1,61 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include "Src/Nodes/SelectInputBaseNode.h"
+
+namespace Vantrel {
+
+SelectInputBaseNode::Choice SelectInputBaseNode::Choose(const RenderParams& params) {
+    Choice choice{params, {}};
+    SelectInput(choice.params, params, choice.input);
+    return choice;
+}
+
+Status SelectInputBaseNode::RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) {
+    const Choice choice = Choose(params);
+    return choice.input->RequestHostFrames(choice.params, results);
+}
+
+Status SelectInputBaseNode::CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) {
+    const Choice choice = Choose(params);
+    return choice.input->CancelHostFrames(choice.params, results);
+}
+
+Status SelectInputBaseNode::BeginUpload(const RenderToken& token, const RenderParams& params,
+                                        const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) {
+    const Choice choice = Choose(params);
+    return choice.input->BeginUpload(token, choice.params, results, blocking, frame);
+}
+
+Status SelectInputBaseNode::FetchHostFrame(const RenderToken& token, const RenderParams& params,
+                                           const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) {
+    const Choice choice = Choose(params);
+    return choice.input->FetchHostFrame(token, choice.params, results, blocking, frame);
+}
+
+Status SelectInputBaseNode::EndFrame(const RenderToken& token, const RenderParams& params,
+                                     const RenderResultsRef& results, std::uint32_t level) {
+    const Choice choice = Choose(params);
+    FilterNode::EndFrame(token, choice.params, results, level);
+    // A second end of input 0, when that is the choice, finds nothing left to do.
+    if (choice.input) choice.input->EndFrame(token, choice.params, results, level);
+    return Ostrand::kStatus_OK;
+}
+
+Status SelectInputBaseNode::CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
+                                              const RenderResultsRef& previous) {
+    const Choice choice = Choose(params);
+    return choice.input->CollectHostFrames(choice.params, results, previous);
+}
+
+Status SelectInputBaseNode::Render(const RenderToken& token, const RenderParams& params,
+                                   const RenderResultsRef& results) {
+    const Choice choice = Choose(params);
+    if (!choice.input) return Ostrand::kStatus_OK;
+    const Status status = TryWithPurge(token, choice.params, results, [&] {
+        return choice.input->RenderFrame(token, choice.params, results, mFrameSlot);
+    });
+    if (Ostrand::Failed(status)) mFrameSlot.Reset();
+    return status;
+}
+
+}  // namespace Vantrel
