@@ -7,7 +7,8 @@ target_compile_options(vantrel_flags INTERFACE
         -Wno-sign-conversion -fno-math-errno>
     $<$<AND:$<COMPILE_LANGUAGE:C,CXX>,$<BOOL:${VANTREL_WERROR}>>:-Werror>)
 foreach(sanitizer IN LISTS VANTREL_SANITIZE)
-    target_compile_options(vantrel_flags INTERFACE -fsanitize=${sanitizer} -fno-omit-frame-pointer)
+    target_compile_options(vantrel_flags INTERFACE
+        -fsanitize=${sanitizer} -fno-sanitize-recover=all -fno-omit-frame-pointer)
     target_link_options(vantrel_flags INTERFACE -fsanitize=${sanitizer})
 endforeach()
 
