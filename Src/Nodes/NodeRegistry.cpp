@@ -8,6 +8,7 @@
 
 #include "Halden/DebugDatabase.h"
 #include "Src/Filters/DisabledNode.h"
+#include "Src/Filters/Effects/InvertNode.h"
 #include "Src/Filters/Synthetics/SolidColorNode.h"
 #include "Src/VideoNodes/VideoMediaNode.h"
 
@@ -32,6 +33,7 @@ struct RegistryEntry {
 constexpr RegistryEntry kEntries[] = {
     {u"BlackVideoSource", Make<SolidColorNode>},
     {u"DisabledNode", Make<DisabledNode>},
+    {u"TQ.XQVE Invert", Make<InvertNode>},
 };
 
 constexpr const char16_t* kHostRenderClipKey = u"HostRenderClip";
