@@ -43,7 +43,7 @@ function(vantrel_engine_objects name)
     add_library(${target} OBJECT ${ARG_SOURCES})
     add_library(Vantrel::${name} ALIAS ${target})
     target_include_directories(${target} PUBLIC ${PROJECT_SOURCE_DIR} ${PROJECT_SOURCE_DIR}/Include)
-    target_link_libraries(${target} PUBLIC ${ARG_LINK} $<TARGET_NAME_IF_EXISTS:Vantrel::Kiln> Vantrel::Tarn Vantrel::Brae PRIVATE vantrel_flags)
+    target_link_libraries(${target} PUBLIC ${ARG_LINK} Vantrel::Kiln Vantrel::Tarn Vantrel::Brae PRIVATE vantrel_flags)
     set_target_properties(${target} PROPERTIES
         POSITION_INDEPENDENT_CODE ON CXX_VISIBILITY_PRESET hidden VISIBILITY_INLINES_HIDDEN ON)
 endfunction()

@@ -3,6 +3,7 @@
 #include "Src/Nodes/FilterNode.h"
 
 #include "Kiln/Frames.h"
+#include "Ostrand/QueryTable.h"
 #include "Src/Nodes/FindEffectNode.h"
 #include "Src/Nodes/FinishedInputs.h"
 #include "Src/Nodes/NodeRegistry.h"
@@ -22,8 +23,7 @@ constexpr double kLeastReportedMs = 0.01;
 }  // namespace
 
 Status FilterNode::QueryInterface(const Guid& iid, void** out) {
-    if (iid == kInterfaceID) return AnswerInterface<FilterNode>(this, out);
-    return RenderNodeBase::QueryInterface(iid, out);
+    return Ostrand::QueryTable(this, iid, out).Answer<FilterNode>().Otherwise<RenderNodeBase>();
 }
 
 void FilterNode::SetInput(std::size_t index, const RenderNodeRef& node) {

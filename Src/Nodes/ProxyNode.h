@@ -3,6 +3,7 @@
 #pragma once
 
 #include "Ostrand/Allocated.h"
+#include "Ostrand/QueryTable.h"
 #include "Src/Nodes/FilterNode.h"
 
 namespace Vantrel {
@@ -19,8 +20,9 @@ public:
 
     Status QueryInterface(const Guid& iid, void** out) override {
         // All proxies share the identifier, so it answers with what they have in common.
-        if (iid == kInterfaceID) return AnswerInterface<IRenderNode>(this, out);
-        return Outer::QueryInterface(iid, out);
+        return Ostrand::QueryTable(this, iid, out)
+            .template Answer<IRenderNode>(kInterfaceID)
+            .template Otherwise<Outer>();
     }
 
     Status Configure(const VideoNodeRef& description, const RenderRequirements& requirements, bool& host) override {

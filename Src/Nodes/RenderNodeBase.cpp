@@ -5,6 +5,7 @@
 #include <boost/smart_ptr/shared_ptr.hpp>
 
 #include "Ostrand/MixHash.h"
+#include "Ostrand/QueryTable.h"
 #include "Src/Nodes/RenderDescription.h"
 #include "Src/Outside/Suites.h"
 #include "Src/VideoNodes/VideoClipNode.h"
@@ -26,10 +27,7 @@ void RenderNodeBase::Release() {
 }
 
 Status RenderNodeBase::QueryInterface(const Guid& iid, void** out) {
-    if (iid == kInterfaceID) return AnswerInterface<RenderNodeBase>(this, out);
-    if (iid == IRenderNode::kInterfaceID) return AnswerInterface<IRenderNode>(this, out);
-    *out = nullptr;
-    return Ostrand::kStatus_NoInterface;
+    return Ostrand::QueryTable(this, iid, out).Answer<RenderNodeBase>().Answer<IRenderNode>().Result();
 }
 
 void RenderNodeBase::SetInput(std::size_t index, const RenderNodeRef& node) {

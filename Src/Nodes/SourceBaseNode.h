@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include "Ostrand/QueryTable.h"
 #include "Src/Nodes/FilterNode.h"
 #include "Vellum/Time.h"
 
@@ -33,8 +34,7 @@ public:
     void AddRef() override { Base::AddRef(); }
     void Release() override { Base::Release(); }
     Status QueryInterface(const Guid& iid, void** out) override {
-        if (iid == ISourceNode::kInterfaceID) return AnswerInterface<ISourceNode>(this, out);
-        return Base::QueryInterface(iid, out);
+        return Ostrand::QueryTable(this, iid, out).template Answer<ISourceNode>().template Otherwise<Base>();
     }
 
     void SetInput(std::size_t index, const RenderNodeRef& node) override {
