@@ -1,0 +1,129 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+/// Reading a picture between its pixels, for kernels in lanes. Positions are in pixels from the picture's upper left corner,
+/// pixel centres at halves; beyond the border the border's pixels go on. Sums are premultiplied: their colour is weighed by
+/// alpha, and StraightenLanes divides it out again.
+
+#define FILTER_NEAREST 0
+#define FILTER_BILINEAR 1
+#define FILTER_BICUBIC 2
+
+/// The picture that is read, inside a frame.
+typedef struct Region {
+    int pitch;
+    int left, top, width, height;
+} Region;
+
+/// How a filter spreads in one direction.
+typedef struct Reach {
+    float stretch;  // the filter's unit in pixels, at least 1
+    float inverse;
+    float radius;  // in pixels
+    int taps;      // that the filter reaches at most
+} Reach;
+
+/// @param footprint how many of the picture's pixels one pixel of the result covers
+DEVICE_FUNCTION Reach MakeReach(int filter, float footprint) {
+    const float stretch = Max(footprint, 1.0f);
+    Reach reach;
+    reach.stretch = stretch;
+    reach.inverse = 1.0f / stretch;
+    reach.radius = filter == FILTER_BICUBIC ? 2.0f * stretch : stretch;
+    // A stretched filter may begin anywhere between two pixels, and so meet one more than twice its radius.
+    const int whole = (int)Ceil(2.0f * reach.radius);
+    reach.taps = stretch > 1.0f ? whole + 1 : whole;
+    return reach;
+}
+
+DEVICE_FUNCTION float FilterWeight(int filter, float distance) {
+    const float t = Abs(distance);
+    if (filter == FILTER_BILINEAR) return Max(1.0f - t, 0.0f);
+    // Keys' cubic with a = -1/2 (Catmull-Rom).
+    const float inner = (1.5f * t - 2.5f) * t * t + 1.0f;
+    const float outer = ((-0.5f * t + 2.5f) * t - 4.0f) * t + 2.0f;
+    const float beyond = t < 2.0f ? outer : 0.0f;
+    return t < 1.0f ? inner : beyond;
+}
+
+/// The first pixel that the filter reaches from a position.
+DEVICE_FUNCTION int FirstTap(Reach reach, float position) { return (int)Ceil(position - reach.radius - 0.5f); }
+
+DEVICE_FUNCTION void SampleNearest(Lanes4* sum, AnyFrame in, int format, Region region, const float* u, const float* v) {
+    int index[LANES];
+    EACH_LANE(i) {
+        const int column = ClampInt((int)Floor(u[i]), 0, region.width - 1);
+        const int row = ClampInt((int)Floor(v[i]), 0, region.height - 1);
+        index[i] = (region.top + row) * region.pitch + region.left + column;
+    }
+    FetchLanes(sum, in, format, index);
+}
+
+/// The filtered picture at LANES positions, tap by tap. `total` receives the weights' sum.
+DEVICE_FUNCTION void SampleTaps(Lanes4* sum, float* total, AnyFrame in, int format, Region region, int filter, Reach across,
+                                Reach down, const float* u, const float* v) {
+    ClearLanes(sum);
+    EACH_LANE(i) total[i] = 0.0f;
+    for (int j = 0; j < down.taps; ++j) {
+        int line[LANES];
+        float rowWeight[LANES];
+        EACH_LANE(i) {
+            const int row = FirstTap(down, v[i]) + j;
+            rowWeight[i] = FilterWeight(filter, ((float)row + 0.5f - v[i]) * down.inverse);
+            line[i] = (region.top + ClampInt(row, 0, region.height - 1)) * region.pitch + region.left;
+        }
+        for (int k = 0; k < across.taps; ++k) {
+            int index[LANES];
+            float weight[LANES];
+            EACH_LANE(i) {
+                const int column = FirstTap(across, u[i]) + k;
+                weight[i] = rowWeight[i] * FilterWeight(filter, ((float)column + 0.5f - u[i]) * across.inverse);
+                index[i] = line[i] + ClampInt(column, 0, region.width - 1);
+                total[i] += weight[i];
+            }
+            Lanes4 taps;
+            FetchLanes(&taps, in, format, index);
+            EACH_LANE(i) {
+                const float share = weight[i] * taps.w[i];
+                sum->x[i] += share * taps.x[i];
+                sum->y[i] += share * taps.y[i];
+                sum->z[i] += share * taps.z[i];
+                sum->w[i] += share;
+            }
+        }
+    }
+}
+
+/// Divides the colour of a sum by its alpha, and its alpha by the weights' total. An alpha that is 1 but for rounding becomes
+/// 1, one that the cubic's negative weights brought out of 0..1 comes back into it, and where no more than rounding is left
+/// the pixel is transparent black.
+DEVICE_FUNCTION void StraightenLanes(Lanes4* sum, const float* total) {
+    EACH_LANE(i) {
+        const float alpha = sum->w[i] / total[i];
+        const int seen = alpha >= 1e-5f;
+        const float divisor = seen ? 1.0f / sum->w[i] : 0.0f;
+        sum->x[i] = seen ? sum->x[i] * divisor : 0.0f;
+        sum->y[i] = seen ? sum->y[i] * divisor : 0.0f;
+        sum->z[i] = seen ? sum->z[i] * divisor : 0.0f;
+        const float bounded = seen ? alpha : 0.0f;
+        sum->w[i] = alpha > 0.999998f ? 1.0f : bounded;
+    }
+}
+
+#if defined(DIALECT_LEVEL)
+#include "Kiln/Modules/SamplingCpu.h"
+#else
+DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, float* total, AnyFrame in, int format, Region region, int filter,
+                                    Reach across, Reach down, const float* u, const float* v) {
+    SampleTaps(sum, total, in, format, region, filter, across, down, u, v);
+}
+
+/// As SampleFiltered for positions on one line, all at the same v, equally far apart.
+DEVICE_FUNCTION void SampleLine(Lanes4* sum, float* total, AnyFrame in, int format, Region region, int filter,
+                                Reach across, Reach down, const float* u, float v) {
+    float line[LANES];
+    EACH_LANE(i) line[i] = v;
+    SampleTaps(sum, total, in, format, region, filter, across, down, u, line);
+}
+#endif
