@@ -11,7 +11,7 @@
 #include "Src/Kernels/CudaDriver.h"
 #include "Src/Kernels/KernelTable.h"
 #include "Src/Kernels/OpenCLLibrary.h"
-#include "Tests/Kernels/FakeDevice.h"
+#include "Tests/Support/FakeDevice.h"
 
 namespace Vantrel {
 namespace {

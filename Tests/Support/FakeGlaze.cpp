@@ -74,10 +74,9 @@ Glaze* NewFakeGlaze(const FakePicture& picture) {
 bool DisposeFakeGlaze(Glaze* glaze) {
     LiveGlazes& live = Live();
     const std::lock_guard<std::mutex> lock(live.mutex);
-    const auto found = std::find_if(live.glazes.begin(), live.glazes.end(),
-                                    [glaze](const std::unique_ptr<Glaze>& candidate) {
-                                        return candidate.get() == glaze;
-                                    });
+    const auto found =
+        std::find_if(live.glazes.begin(), live.glazes.end(),
+                     [glaze](const std::unique_ptr<Glaze>& candidate) { return candidate.get() == glaze; });
     if (found == live.glazes.end()) return false;
     Release(glaze->storage);
     live.glazes.erase(found);

@@ -196,8 +196,7 @@ VantrelHostStatus FakeHost::ReadParam(std::uint32_t id, std::int32_t index, std:
     return 0;
 }
 
-VantrelHostStatus FakeHost::FindKeyframe(std::uint32_t id, std::int32_t index, std::int64_t ticks,
-                                         std::int64_t* next) {
+VantrelHostStatus FakeHost::FindKeyframe(std::uint32_t id, std::int32_t index, std::int64_t ticks, std::int64_t* next) {
     const FakeNode* node = FindNode(id, "GetNextKeyframeTime");
     const auto param = node ? node->params.find(index) : std::map<std::int32_t, FakeParam>::const_iterator();
     if (!node || param == node->params.end()) return kFails;

@@ -102,7 +102,7 @@ struct FakeRequest {
     std::int64_t frameTicks;
     Vellum::Point sequenceSize;
     Vellum::PixelAspectRatio aspect;
-    VantrelRenderDescription description;    ///< its list of formats is copied into the next field
+    VantrelRenderDescription description;  ///< its list of formats is copied into the next field
     std::vector<std::uint32_t> pixelFormats;
     VantrelClipRecord clip;
 };
@@ -125,9 +125,9 @@ struct FakeClip {
     VantrelHostStatus frameHashStatus = 0;
 };
 
-/// A host in memory with all six suites, scripted by its public fields. It counts the calls, and fails the test when it is
-/// called wrongly: unknown or released ids, text or pictures that aren't given back, releases too many. One lives at a
-/// time. The script may be changed while no render runs.
+/// A host in memory with all six suites, scripted by its public fields. It counts the calls, and fails the test when it
+/// is called wrongly: unknown or released ids, text or pictures that aren't given back, releases too many. One lives at
+/// a time. The script may be changed while no render runs.
 class FakeHost {
 public:
     FakeHost();

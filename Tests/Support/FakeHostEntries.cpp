@@ -39,8 +39,7 @@ FakeRequest MakeRequest(FakeRequest::Kind kind, std::uint32_t sequenceID, std::u
     request.sequenceSize = size;
     request.aspect = aspect;
     request.description = *description;
-    request.pixelFormats.assign(description->pixelFormats,
-                                description->pixelFormats + description->pixelFormatCount);
+    request.pixelFormats.assign(description->pixelFormats, description->pixelFormats + description->pixelFormatCount);
     request.description.pixelFormats = nullptr;
     return request;
 }
@@ -247,8 +246,8 @@ void FakeHostEntries::FillRenders(CorvaneVideoSegmentRenderSuite& suite) {
                                void* context, std::uint32_t* requestID) -> VantrelHostStatus {
         Call call("RenderOperators");
         call.host.FindNode(clip, "RenderOperators");
-        const FakeRequest request = MakeRequest(Kind::kOperators, sequence, clip, first, end, time, rawTime,
-                                                frameTicks, {width, height}, {numerator, denominator}, description);
+        const FakeRequest request = MakeRequest(Kind::kOperators, sequence, clip, first, end, time, rawTime, frameTicks,
+                                                {width, height}, {numerator, denominator}, description);
         call.lock.unlock();
         return call.host.Render(request, callback, context, requestID);
     };
@@ -260,8 +259,8 @@ void FakeHostEntries::FillRenders(CorvaneVideoSegmentRenderSuite& suite) {
         const Call call("GetOperatorsFrameHash");
         const FakeNode* scripted = call.host.FindNode(clip, "GetOperatorsFrameHash");
         if (!scripted) return kFails;
-        return call.host.AnswerHash(MakeRequest(Kind::kOperators, sequence, clip, first, end, time, rawTime,
-                                                frameTicks, {width, height}, {numerator, denominator}, description),
+        return call.host.AnswerHash(MakeRequest(Kind::kOperators, sequence, clip, first, end, time, rawTime, frameTicks,
+                                                {width, height}, {numerator, denominator}, description),
                                     scripted->frameHashText, scripted->frameHashStatus, text);
     };
     suite.CancelRequest = [](std::uint32_t requestID) -> VantrelHostStatus {
