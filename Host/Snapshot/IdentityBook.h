@@ -20,9 +20,10 @@ public:
     [[nodiscard]] std::uint32_t TimelineID(const std::string& path);
     /// Of an effect instance, from 1 up.
     [[nodiscard]] std::uint32_t InstanceID(const std::string& path);
-    /// The clip of a media record. Equal keys give the same clip while anybody holds it, and the same id for ever.
-    /// @param key names everything that a frame of the clip depends on
-    [[nodiscard]] MediaClipPtr Clip(const std::string& key, const MediaInfo& info, const MediaSource& source);
+    /// The clip of a media record. Equal identities give the same clip while anybody holds it, and the same id for
+    /// ever.
+    /// @param identity of everything that a frame of the clip depends on
+    [[nodiscard]] MediaClipPtr Clip(const Guid& identity, const MediaInfo& info, const MediaSource& source);
     /// Null for an unknown id, and for one that no snapshot or node holds any more.
     [[nodiscard]] MediaClipPtr FindClip(std::uint32_t clipID) const;
 
@@ -36,8 +37,8 @@ private:
     mutable std::mutex mMutex;
     std::map<std::string, std::uint32_t> mTimelines{{"", 1}};
     std::map<std::string, std::uint32_t> mInstances;
-    std::map<std::string, ClipEntry> mClips;
-    std::map<std::uint32_t, std::string> mClipKeys;
+    std::map<Guid, ClipEntry> mClips;
+    std::map<std::uint32_t, Guid> mClipIdentities;
 };
 
 }  // namespace Vantrel::Host

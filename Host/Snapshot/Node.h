@@ -24,6 +24,13 @@ using NodePtr = std::shared_ptr<const Node>;
 using SequencePtr = std::shared_ptr<const Sequence>;
 using Halden::utility::Guid;
 
+struct NodeInput {
+    /// The input's time 0 in this node's time.
+    std::int64_t offset = 0;
+    /// Null where a transition has nothing on one side.
+    NodePtr node;
+};
+
 struct SequenceFormat {
     std::int32_t width = 1920;
     std::int32_t height = 1080;
@@ -70,6 +77,8 @@ struct MediaClip {
     /// Sizes and rates are never open here: a still has the rate of its sequence.
     MediaInfo info;
     MediaSource source;
+    /// Equal for clips whose frames are equal.
+    Guid identity;
 };
 using MediaClipPtr = std::shared_ptr<const MediaClip>;
 
@@ -102,6 +111,11 @@ struct EffectDetail {
     /// By rising index, keys in parameter time.
     std::vector<Parameter> parameters;
     bool timeDependent = false;
+    /// Of a track matte: the layer that it takes its matte from, at its offset in the clip's own time; null if the
+    /// segment has no such layer.
+    NodeInput matte;
+    /// Of all that the effect does when no parameter moves; nil if one does.
+    Guid constantHash;
 };
 
 struct TransitionDetail {
@@ -129,13 +143,6 @@ enum class NodeKind {
 
 /// The name by which the engine knows a kind ("RenderableNodeClipImpl").
 [[nodiscard]] const char* GetKindText(NodeKind kind);
-
-struct NodeInput {
-    /// The input's time 0 in this node's time.
-    std::int64_t offset = 0;
-    /// Null where a transition has nothing on one side.
-    NodePtr node;
-};
 
 using Properties = std::vector<std::pair<std::string, std::string>>;
 

@@ -164,7 +164,11 @@ MediaReference ReadMediaReference(const JsonCursor& at, const std::string& direc
         at.Fail("version " + std::to_string(schema.version) + " of " + schema.name + " isn't known");
     MediaReference reference;
     reference.path = at.Path();
-    if (const auto range = at.Find("available_range")) reference.availableRange = ReadTimeRange(*range).range;
+    if (const auto range = at.Find("available_range")) {
+        const ReadRange read = ReadTimeRange(*range);
+        reference.availableRange = read.range;
+        reference.availableFrameTicks = read.frameTicks;
+    }
     if (schema.name == "ExternalReference") {
         reference.file = ResolveUrl(at.Get("target_url"), directory);
         reference.kind = reference.file.empty() ? ReferenceKind::kMissing : ReferenceKind::kFile;

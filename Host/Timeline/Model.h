@@ -66,6 +66,8 @@ struct MediaReference {
     std::string path;
     ReferenceKind kind = ReferenceKind::kMissing;
     std::optional<TimeRange> availableRange;
+    /// Frame length of `availableRange`, as snapped.
+    std::int64_t availableFrameTicks = 0;
     /// kFile: absolute path; kImageSequence: of the first image.
     std::string file;
     ImageSequence images;
