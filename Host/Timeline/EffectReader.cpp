@@ -5,7 +5,6 @@
 
 #include "Host/Timeline/EffectTables.h"
 #include "Host/Timeline/FieldReaders.h"
-#include "Kiln/BlendMode.h"
 #include "Marl/BinaryData.h"
 
 namespace Vantrel::Host {
@@ -51,7 +50,16 @@ private:
     [[nodiscard]] std::string Describe() const { return "\"" + mParameter.name + "\" of \"" + mMatchName + "\""; }
 
     [[noreturn]] void FailType(const JsonCursor& at) const {
-        at.Fail(Describe() + " is a " + GetParameterTypeName(mParameter.type) + ", found " + at.KindName());
+        at.Fail(Describe() + " is of type " + GetParameterTypeName(mParameter.type) + ", found " + at.KindName());
+    }
+
+    [[nodiscard]] std::int32_t FindChoice(const JsonCursor& at) const {
+        std::string accepted;
+        for (std::int32_t choice = 0; const char* name = mParameter.choiceName(choice); ++choice) {
+            if (at.Text() == name) return choice;
+            accepted += (accepted.empty() ? "" : ", ") + std::string(name);
+        }
+        at.Fail(Describe() + " has no choice \"" + at.Text() + "\"; accepted are " + accepted);
     }
 
     [[nodiscard]] ParameterValue ReadValue(const JsonCursor& at) const {
@@ -65,9 +73,8 @@ private:
             std::copy(numbers.begin(), numbers.end(), value.begin());
             return value;
         }
-        if (json.is_string() && mMatchName == kOpacityMatchName && mParameter.type == ParameterType::kInt) {
-            value[0] = Kiln::FindBlendMode(at.Text().c_str());
-            if (value[0] < 0) at.Fail("no blend mode is called \"" + at.Text() + "\"");
+        if (json.is_string() && mParameter.choiceName != nullptr) {
+            value[0] = FindChoice(at);
             return value;
         }
         if (json.is_boolean() && mParameter.type == ParameterType::kBool) {

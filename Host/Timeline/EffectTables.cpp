@@ -6,12 +6,13 @@
 #include <initializer_list>
 #include <utility>
 
+#include "Vantrel/EffectTable.h"
+
 namespace Vantrel::Host {
 namespace {
 
 using Type = ParameterType;
 
-constexpr double kNormalBlend = 18;
 constexpr double kFullScale = 255;
 
 /// Puts a table together; indices that nobody reads are filled so that every index up to the highest one exists.
@@ -19,7 +20,8 @@ class Builder {
 public:
     explicit Builder(const char* matchName) { mTable.matchName = matchName; }
 
-    Builder& Row(std::int32_t index, std::string name, Type type, ParameterValue value = {}) & {
+    Builder& Row(std::int32_t index, std::string name, Type type, ParameterValue value = {},
+                 const char* (*choiceName)(std::int32_t) = nullptr) & {
         while (static_cast<std::int32_t>(mTable.parameters.size()) < index) {
             Parameter filler;
             filler.index = static_cast<std::int32_t>(mTable.parameters.size());
@@ -30,6 +32,7 @@ public:
         parameter.name = std::move(name);
         parameter.type = type;
         parameter.value = value;
+        parameter.choiceName = choiceName;
         mTable.parameters.push_back(std::move(parameter));
         return *this;
     }
@@ -366,16 +369,20 @@ void AddSpatial(std::vector<EffectTable>& tables) {
     tables.push_back(stabilizer.Finish());
 }
 
+/// An effect that the engine lists itself.
+EffectTable FromEngine(const EffectRow& effect) {
+    Builder table(effect.matchName);
+    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+        const ParameterRow& row = effect.parameters[i];
+        table.Row(row.index, row.name, row.type, row.value, row.choiceName);
+    }
+    return table.Finish();
+}
+
+/// What the engine lists goes before what is known here of the other effects.
 std::vector<EffectTable> MakeTables() {
-    const ParameterValue middle{0.5, 0.5};
     std::vector<EffectTable> tables;
-    tables.push_back(Simple(
-        kMotionMatchName,
-        {P("position", Type::kPoint, middle), P("scale", Type::kFloat, {100}), P("scale_width", Type::kFloat, {100}),
-         P("uniform_scale", Type::kBool, {1}), P("rotation", Type::kFloat), P("anchor", Type::kPoint, middle)}));
-    tables.push_back(
-        Simple(kOpacityMatchName, {P("opacity", Type::kFloat, {100}), P("blend_mode", Type::kInt, {kNormalBlend})}));
-    tables.push_back(Simple("TQ.XQVE Invert", {P("channel", Type::kInt), P("blend", Type::kFloat)}));
+    for (const EffectRow* effect : kEffectTable) tables.push_back(FromEngine(*effect));
     AddPointwise(tables);
     AddSpatial(tables);
     tables.push_back(LumaCorrector());

@@ -9,23 +9,10 @@
 #include <vector>
 
 #include "Host/Time/TimeMap.h"
+#include "Vantrel/Effects/EffectRow.h"
 #include "Vantrel/HostSuites.h"
 
 namespace Vantrel::Host {
-
-/// How an effect reads a parameter; the numbers are the type words of the record in which the value travels.
-enum class ParameterType : std::int32_t {
-    kBool = 1,
-    kByte,
-    kShort,
-    kInt,
-    kInt64,
-    kFloat,
-    kDouble,
-    /// Red, green, blue, alpha in 0..1.
-    kColor,
-    kPoint,
-};
 
 [[nodiscard]] const char* GetParameterTypeName(ParameterType type);
 
@@ -53,6 +40,8 @@ struct Parameter {
     ParameterValue value{};
     /// Sorted by time, no two at the same one.
     std::vector<Keyframe> keys;
+    /// The name of a choice; null where the parameter isn't one.
+    const char* (*choiceName)(std::int32_t choice) = nullptr;
 
     [[nodiscard]] bool IsAnimated() const { return keys.size() > 1; }
     /// The value at a time: constant before the first key and after the last; bools and whole numbers hold.
