@@ -1,0 +1,142 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include <gmock/gmock.h>
+
+#include "Tests/Timeline/TimelineTester.h"
+
+namespace Vantrel::Testing {
+namespace {
+
+/// A clip at 0..1000 of an inner sequence that holds a clip with two effects at 0..300 and a plain one at 300..800.
+class NestedSequence : public TimelineTester {
+protected:
+    NestedSequence() {
+        AddNestedClip(10);
+        AddEffect(20, "Blur");
+        AddEffect(21, "TQ.XQVE Motion");
+        AddPlainClip(11, {20, 20, 21});
+        AddPlainClip(12);
+        AddSegment(kInner, 0, 300, 11);
+        AddSegment(kInner, 300, 800, 12, 60);
+    }
+};
+
+TEST_F(NestedSequence, ItsTreesGoToItsNodeAndItsWorkIsCounted) {
+    const SegmentInfo info = Build(10);
+    EXPECT_EQ(info.out, 1000);
+    EXPECT_TRUE(info.nested && info.accelerated && !info.flattened);
+    EXPECT_EQ(info.effectCount, 0);
+    EXPECT_EQ(info.nestedEffectCount, 2);
+    EXPECT_EQ(info.nestedIntrinsicCount, 1);
+    EXPECT_EQ(info.nestedLayerCount, 1) << "no stack anywhere";
+
+    const ProbeNode& node = Probe(info.tree);
+    EXPECT_EQ(node.key, "NestedTimelineNode");
+    EXPECT_EQ(Describe(node.defaultTree), "BlackVideoSource");
+    ASSERT_EQ(node.segmentTrees.size(), 2U);
+    EXPECT_EQ(Describe(node.segmentTrees[0].tree), "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))");
+    EXPECT_EQ(node.segmentTrees[1].start, 300);
+    EXPECT_EQ(node.segmentTrees[1].sourceStart, 60);
+    EXPECT_EQ(node.segmentTrees[1].end, 800);
+}
+
+TEST_F(NestedSequence, ItsStacksAddUpAsNestedLayers) {
+    AddNode(30, "Compositor", {11, 12, 12});
+    host.sequences[kInner].segments = {{0, 300, 0, NumberedGuid(30), 30}};
+    const SegmentInfo info = Build(10);
+    EXPECT_EQ(info.layerCount, 0);
+    EXPECT_EQ(info.nestedLayerCount, 5) << "1 + 3 of the segment, and 1 of the media";
+}
+
+TEST_F(NestedSequence, TheStatisticsTellItsMomentsApartAndTheRenderingDoesNot) {
+    Build(10);
+    EXPECT_EQ(InfoAt(500).in, 0);
+    EXPECT_EQ(InfoAt(100, true).effectCount, 2);
+    EXPECT_EQ(InfoAt(100, true).out, 300);
+    EXPECT_EQ(InfoAt(500, true).effectCount, 0);
+    EXPECT_EQ(InfoAt(900, true).in, 800) << "the inner sequence's gap";
+}
+
+TEST_F(NestedSequence, ItsRangeFollowsOffsetAndSpeed) {
+    host.sequences[kTop].segments.clear();
+    AddSegment(kTop, 100, 300, 10, 50);
+    host.nodes[510].properties["MediaNode::ClipSpeed"] = "2.0";
+    Read();
+    const SegmentInfo info = InfoAt(100);
+    EXPECT_TRUE(info.hostPart) << "a nested sequence at another speed needs the host";
+    const auto& trees = Probe(info.tree).segmentTrees;
+    ASSERT_EQ(trees.size(), 2U) << "200..600 is the inner 100..500";
+    EXPECT_EQ(trees[0].start, 100);
+    EXPECT_EQ(trees[0].end, 400);
+    EXPECT_EQ(trees[1].start, 400);
+    EXPECT_EQ(trees[1].end, 900);
+}
+
+TEST_F(NestedSequence, WithoutANodeForItThePiecesGoIntoTheMaps) {
+    refused.insert("NestedTimelineNode");
+    unregistered.insert("NestedTimelineNode");
+    const SegmentInfo first = Build(10);
+    EXPECT_EQ(Describe(first.tree), "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))");
+    EXPECT_EQ(first.out, 300);
+    EXPECT_EQ(InfoAt(300).guid, NumberedGuid(12));
+    EXPECT_EQ(InfoAt(300).offset, 60);
+    EXPECT_EQ(Describe(InfoAt(900).tree), "BlackVideoSource");
+    EXPECT_EQ(InfoAt(900).out, 1000);
+}
+
+TEST_F(NestedSequence, AHostRenderInItsNodesPlaceIsNoNodeForIt) {
+    unregistered.insert("NestedTimelineNode");
+    EXPECT_EQ(Describe(Build(10).tree), "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))");
+}
+
+TEST_F(NestedSequence, OnlyAPlainClipOfMatchingMediaIsFlattened) {
+    refused.insert("NestedTimelineNode");
+    unregistered.insert("NestedTimelineNode");
+    const struct {
+        std::uint32_t node;
+        const char* key;
+        const char* value;
+    } obstacles[] = {{510, "MediaNode::StreamFrameHeight", "72"}, {510, "MediaNode::StreamFrameRate", "5"},
+                     {510, "MediaNode::ClipSpeed", "0.5"},        {10, "ClipNode::ClipSpeed", "2"},
+                     {10, "ClipNode::ClipBackwards", "1"},        {10, "ClipNode::TimeRemapping", "x"},
+                     {10, "ClipNode::FrameHoldAtTime", "0"}};
+    for (const auto& obstacle : obstacles) {
+        auto& properties = host.nodes[obstacle.node].properties;
+        const auto before = properties;
+        properties[obstacle.key] = obstacle.value;
+        const SegmentInfo info = Build(10);
+        EXPECT_EQ(Describe(info.tree), "HostRenderSource") << obstacle.key;
+        EXPECT_TRUE(info.hostWhole && info.hostPart);
+        properties = before;
+    }
+}
+
+TEST_F(NestedSequence, WhenItCannotBeReadItsSegmentHasNoEntry) {
+    host.sequences[kInner].infoFails = true;
+    AddPlainClip(13);
+    AddSegment(kTop, 0, 1000, 10);
+    AddSegment(kTop, 1000, 2000, 13);
+    Read();
+    SegmentInfo info;
+    EXPECT_EQ(timeline->GetSegmentInfo(500, info, false), 11);
+    EXPECT_EQ(timeline->GetSegmentInfo(500, info, true), 11);
+    EXPECT_EQ(InfoAt(1500).guid, NumberedGuid(13)) << "the walk over the others goes on";
+}
+
+TEST_F(NestedSequence, ANestedHostSegmentTakesAccelerationAwayFromItsMoment) {
+    needHost.insert("Blur");
+    Build(10);
+    EXPECT_FALSE(InfoAt(100, true).accelerated);
+    EXPECT_TRUE(InfoAt(100, true).hostPart);
+    EXPECT_TRUE(InfoAt(500, true).accelerated);
+}
+
+TEST_F(NestedSequence, AMulticamTracksSequenceServesWhenThereIsNoOther) {
+    host.nodes[510].properties.erase("MediaNode::NestedSequenceTimelineID");
+    host.nodes[510].properties["MediaNode::SelectedMulticamTrackTimelineID"] = std::to_string(kInner);
+    host.nodes[510].properties["MediaNode::SelectedMulticamTrack"] = "7";
+    EXPECT_EQ(Probe(Build(10).tree).segmentTrees.size(), 2U);
+}
+
+}  // namespace
+}  // namespace Vantrel::Testing

@@ -1,0 +1,221 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include <gmock/gmock.h>
+
+#include "Halden/Trace.h"
+#include "Tests/Timeline/TimelineTester.h"
+
+namespace Vantrel::Testing {
+namespace {
+
+using ::testing::Contains;
+using ::testing::Not;
+
+using TimelineUpdate = TimelineTester;
+
+constexpr std::int64_t kEnd = Vellum::kTime_Max;
+
+TEST_F(TimelineUpdate, GapsAreBlackAndReachToTheEndOfTime) {
+    AddPlainClip(10);
+    AddSegment(kTop, 100, 200, 10, 7);
+    Read();
+    for (const std::int64_t ticks : {std::int64_t{0}, std::int64_t{99}, std::int64_t{200}, kEnd - 1}) {
+        const SegmentInfo gap = InfoAt(ticks);
+        EXPECT_EQ(gap.in, ticks < 100 ? 0 : 200);
+        EXPECT_EQ(gap.out, ticks < 100 ? 100 : kEnd);
+        EXPECT_EQ(Describe(gap.tree), "BlackVideoSource");
+        EXPECT_TRUE(gap.guid.IsNil() && gap.accelerated && gap.realTime);
+    }
+    const SegmentInfo clip = InfoAt(199);
+    EXPECT_EQ(clip.in, 100);
+    EXPECT_EQ(clip.out, 200);
+    EXPECT_EQ(clip.offset, 7);
+    EXPECT_EQ(clip.guid, NumberedGuid(10));
+    SegmentInfo info;
+    EXPECT_EQ(timeline->GetSegmentInfo(kEnd, info, false), 11);
+    EXPECT_EQ(timeline->GetSegmentInfo(-1, info, true), 11);
+}
+
+TEST_F(TimelineUpdate, AnEmptySequenceIsOneBlackStretch) {
+    Read();
+    EXPECT_EQ(InfoAt(0).out, kEnd);
+    EXPECT_EQ(created, std::vector<std::string>{"BlackVideoSource"});
+}
+
+TEST_F(TimelineUpdate, AnUnchangedSequenceCostsOneHashCall) {
+    AddPlainClip(10);
+    AddSegment(kTop, 0, 100, 10);
+    Timeline& read = Read();
+    const Guid hash = read.GetTimelineHash();
+    EXPECT_EQ(hash, host.sequences[kTop].hash);
+    host.ResetCounts();
+    created.clear();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_EQ(host.Count("GetSegmentsHash"), 1);
+    EXPECT_EQ(host.Count("GetSegmentCount") + host.Count("GetSequenceInfo"), 0);
+    EXPECT_TRUE(created.empty());
+    EXPECT_EQ(read.GetTimelineHash(), hash);
+
+    host.sequences[kTop].hashFails = true;
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_EQ(host.Count("GetSegmentCount"), 1) << "without a hash there is no short cut";
+}
+
+TEST_F(TimelineUpdate, AMovedClipKeepsItsTreeAndLeavesBlackBehind) {
+    AddPlainClip(10);
+    AddPlainClip(11);
+    AddSegment(kTop, 0, 100, 10);
+    AddSegment(kTop, 100, 200, 11);
+    Timeline& read = Read();
+    const RenderNodeRef moved = InfoAt(0).tree, still = InfoAt(100).tree;
+
+    host.sequences[kTop].segments[0] = {500, 600, 0, NumberedGuid(10), 10};
+    std::swap(host.sequences[kTop].segments[0], host.sequences[kTop].segments[1]);
+    Change();
+    created.clear();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_TRUE(created.empty());
+    EXPECT_EQ(InfoAt(500).tree, moved);
+    EXPECT_EQ(InfoAt(100).tree, still);
+    EXPECT_EQ(Describe(InfoAt(0).tree), "BlackVideoSource");
+    EXPECT_EQ(Describe(InfoAt(300).tree), "BlackVideoSource");
+    EXPECT_TRUE(InfoAt(0, true).guid.IsNil()) << "the statistics forget it as well";
+
+    // What stood unchanged wasn't in that update's cache, and yet it lives on where it stands.
+    Change();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_TRUE(created.empty());
+    EXPECT_EQ(InfoAt(150).tree, still);
+}
+
+TEST_F(TimelineUpdate, AnotherOffsetOrLengthReplacesTheRecordButNotTheTree) {
+    AddPlainClip(10);
+    AddSegment(kTop, 0, 100, 10);
+    Timeline& read = Read();
+    const RenderNodeRef tree = InfoAt(0).tree;
+    host.sequences[kTop].segments[0] = {0, 80, 20, NumberedGuid(10), 10};
+    Change();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_EQ(InfoAt(0).tree, tree);
+    EXPECT_EQ(InfoAt(0).offset, 20);
+    EXPECT_EQ(InfoAt(79).out, 80);
+    EXPECT_EQ(Describe(InfoAt(80).tree), "BlackVideoSource");
+}
+
+TEST_F(TimelineUpdate, TheSameContentTwiceIsBuiltOnceAndTraced) {
+    std::vector<std::string> lines;
+    Halden::debug::SetTraceSink([&lines](const std::string& line) { lines.push_back(line); });
+    Halden::debug::SetTraceLevel("Timeline.AddSegments", 10);
+    AddEffect(20, "Some Effect");
+    AddPlainClip(10, {20});
+    needHost.insert("Some Effect");
+    AddSegment(kTop, 0, 100, 10);
+    AddSegment(kTop, 300, 400, 10, 50);
+    Read();
+    Halden::debug::SetTraceLevel("Timeline.AddSegments", -1);
+    Halden::debug::SetTraceSink({});
+
+    EXPECT_EQ(std::count(created.begin(), created.end(), "HostRenderClip"), 1);
+    const SegmentInfo first = InfoAt(0), second = InfoAt(300);
+    EXPECT_EQ(first.tree, second.tree);
+    EXPECT_EQ(second.offset, 50);
+    EXPECT_EQ(second.layerCount, first.layerCount);
+    EXPECT_TRUE(second.hostPart && !second.accelerated && !second.realTime);
+
+    const std::string guid = NumberedGuid(10).ToString();
+    ASSERT_EQ(lines.size(), 2U);
+    EXPECT_THAT(lines[0], ::testing::EndsWith("> <Timeline.AddSegments> <10> Add segment......, GUID: " + guid));
+    EXPECT_THAT(lines[1], ::testing::EndsWith("Add segment, reusing tree (new seg)..., GUID: " + guid +
+                                              ", in: 300, out: 400, offset: 50"));
+}
+
+TEST_F(TimelineUpdate, AChildStartsWithTheParentsTrees) {
+    AddPlainClip(10);
+    AddSegment(kTop, 0, 100, 10);
+    const std::unique_ptr<Timeline> parent = MakeTimeline(kTop, false, 0, nullptr);
+    SegmentInfo ofParent;
+    ASSERT_EQ(parent->GetSegmentInfo(0, ofParent, false), Ostrand::kStatus_OK);
+    host.sequences[kTop].segments[0].start = 40;
+    created.clear();
+    Read(false, 0, parent.get());
+    EXPECT_TRUE(created.empty()) << "neither the clip nor black is built again";
+    EXPECT_EQ(InfoAt(40).tree, ofParent.tree);
+    EXPECT_EQ(Describe(InfoAt(0).tree), "BlackVideoSource");
+    ASSERT_EQ(parent->GetSegmentInfo(0, ofParent, false), Ostrand::kStatus_OK);
+    EXPECT_EQ(ofParent.in, 0) << "the parent's own segments stay";
+}
+
+TEST_F(TimelineUpdate, AnEntryThatLiesBehindWhatWasReachedIsPassedOver) {
+    AddPlainClip(10);
+    AddPlainClip(11);
+    AddSegment(kTop, 0, 100, 10);
+    AddSegment(kTop, 20, 100, 11);
+    Read();
+    EXPECT_EQ(InfoAt(50).guid, NumberedGuid(10));
+    EXPECT_EQ(InfoAt(100).in, 100);
+}
+
+TEST_F(TimelineUpdate, FailuresLeaveTheMapsAloneAndTheNextUpdateReadsAnew) {
+    AddPlainClip(10);
+    AddSegment(kTop, 0, 100, 10);
+    Timeline& read = Read();
+    host.sequences[kTop].infoFails = true;
+    Change();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_Failure);
+    EXPECT_TRUE(read.GetTimelineHash().IsNil());
+    EXPECT_EQ(InfoAt(0).guid, NumberedGuid(10));
+    host.sequences[kTop].infoFails = false;
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_EQ(read.GetTimelineHash(), host.sequences[kTop].hash);
+
+    host.sequences[kTop].acquireFails = true;
+    Change();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK) << "no list is no failure";
+    EXPECT_EQ(InfoAt(0).guid, NumberedGuid(10));
+}
+
+TEST_F(TimelineUpdate, WithoutASequenceThereIsNothing) {
+    timeline = MakeTimeline(0, false, 0, nullptr);
+    EXPECT_EQ(timeline->UpdateTimeline(), Ostrand::kStatus_Failure);
+    SegmentInfo info;
+    EXPECT_EQ(timeline->GetSegmentInfo(0, info, false), 11);
+    Vellum::Rect rect;
+    Vellum::PixelAspectRatio aspect;
+    Vellum::FrameRate rate;
+    std::uint32_t field = 0;
+    EXPECT_EQ(timeline->GetSequenceFormat(rect, aspect, rate, field), 99);
+
+    Read();
+    EXPECT_EQ(timeline->GetSequenceFormat(rect, aspect, rate, field), 0);
+    EXPECT_EQ(rect, (Vellum::Rect{0, 0, 64, 36}));
+    EXPECT_EQ(rate.GetTicksPerFrame(), 10160640000);
+}
+
+TEST_F(TimelineUpdate, PreviewListsAreReadByTheirOwnEntries) {
+    AddNestedClip(10);
+    AddSegment(kTop, 0, 100, 10);
+    Read(true);
+    EXPECT_EQ(host.Count("AcquireVideoSegmentsWithPreviews"), 1);
+    EXPECT_EQ(host.Count("AcquireNestedVideoSegmentsWithPreviews"), 1);
+    EXPECT_EQ(host.Count("AcquireVideoSegments"), 0);
+}
+
+TEST_F(TimelineUpdate, TreesWithANestedSequenceAreNeverTakenOver) {
+    AddNestedClip(10);
+    AddPlainClip(11);
+    AddSegment(kInner, 0, 1000, 11);
+    AddSegment(kTop, 0, 100, 10);
+    AddSegment(kTop, 100, 200, 10, 100);
+    Timeline& read = Read();
+    const auto count = [this](const char* key) { return std::count(created.begin(), created.end(), key); };
+    EXPECT_EQ(count("NestedTimelineNode"), 2) << "once for each range";
+    EXPECT_EQ(count("HostRenderClip"), 1) << "what lies within is built once";
+    Change();
+    created.clear();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_EQ(count("NestedTimelineNode"), 2);
+    EXPECT_EQ(count("HostRenderClip"), 0);
+}
+
+}  // namespace
+}  // namespace Vantrel::Testing
