@@ -34,7 +34,7 @@ class RenderResults {
 public:
     RenderResults() = default;
     explicit RenderResults(boost::function<void()> completion, std::uint32_t outstanding = 1)
-        : mOutstanding(outstanding), mCompletion(std::move(completion)) {}
+        : mHasCompletion(!completion.empty()), mOutstanding(outstanding), mCompletion(std::move(completion)) {}
 
     /// Answered by FindPendingRequest for a fingerprint without a request.
     static constexpr Status kStatus_NoRequest = static_cast<Status>(0x80000000);
@@ -77,6 +77,8 @@ private:
     std::atomic<std::uint32_t> mFailed{0};
     std::set<Guid> mLoggedFrames;
     std::string mLog;
+    /// Falls once, by whoever then runs the completion; a render may begin pieces meanwhile.
+    std::atomic<bool> mHasCompletion{false};
     std::atomic<std::uint32_t> mOutstanding{0};
     boost::function<void()> mCompletion;
 };
@@ -150,11 +152,11 @@ inline void RenderResults::SetSelectedFrame(const VideoFrameRef& frame) {
 }
 
 inline void RenderResults::BeginAsyncPiece() {
-    if (mCompletion) ++mOutstanding;
+    if (mHasCompletion) ++mOutstanding;
 }
 
 inline void RenderResults::EndAsyncPiece() {
-    if (!mCompletion || --mOutstanding != 0) return;
+    if (!mHasCompletion || --mOutstanding != 0 || !mHasCompletion.exchange(false)) return;
     boost::function<void()> completion;
     completion.swap(mCompletion);
     completion();
