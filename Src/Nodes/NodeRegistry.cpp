@@ -7,9 +7,17 @@
 #include <string>
 
 #include "Halden/DebugDatabase.h"
+#include "Src/Filters/CompositorNode.h"
 #include "Src/Filters/DisabledNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
+#include "Src/Filters/HostRenderSubtreeNode.h"
+#include "Src/Filters/IntrinsicNode.h"
+#include "Src/Filters/MediaNode.h"
+#include "Src/Filters/SWHostRenderClipPrefetch.h"
 #include "Src/Filters/Synthetics/SolidColorNode.h"
+#include "Src/Filters/UploadNode.h"
+#include "Src/Nodes/FrameSizeLimit.h"
+#include "Src/Nodes/ProxyNode.h"
 #include "Src/VideoNodes/VideoMediaNode.h"
 
 namespace Vantrel {
@@ -32,8 +40,17 @@ struct RegistryEntry {
 /// Every node that a name can stand for. Structure first, then effects, transitions and synthetic media.
 constexpr RegistryEntry kEntries[] = {
     {u"BlackVideoSource", Make<SolidColorNode>},
+    {u"LayerBlendNode", Make<CompositorNode>},
+    {u"HostRenderSource", Make<HostRenderSourceNode>},
+    {u"HostRenderClip", Make<ProxyNode<MediaNode, ProxyNode<UploadNode, SWHostRenderClipPrefetch>>>},
+    {u"HostRenderSubtree", Make<ProxyNode<UploadNode, HostRenderSubtreeNode>>},
+    {u"TQ.XQVE Opacity", Make<IntrinsicNode>},
+    {u"TQ.XQVE Motion", Make<IntrinsicNode>},
     {u"DisabledNode", Make<DisabledNode>},
     {u"TQ.XQVE Invert", Make<InvertNode>},
+    {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
+    {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
+    {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},
 };
 
 constexpr const char16_t* kHostRenderClipKey = u"HostRenderClip";
@@ -86,16 +103,6 @@ RenderNodeRef MakeByKey(const WideString& key, const Kiln::DeviceRef& device, co
     return node;
 }
 
-/// Would the frames that a node may hold at once go beyond what the device allows?
-bool IsOversized(const Vellum::Rect& rect, const Kiln::Device& device) {
-    constexpr std::uint32_t kLargestPixel = 16;
-    constexpr std::uint64_t kFramesOfANode = 4;
-    const auto bytes = static_cast<std::int32_t>(static_cast<std::uint32_t>(rect.Width()) *
-                                                 static_cast<std::uint32_t>(rect.Height()) * kLargestPixel);
-    // A product beyond 31 bits is negative and, widened, larger than any limit.
-    return static_cast<std::uint64_t>(std::int64_t{bytes}) * kFramesOfANode > device.GetMemoryLimit();
-}
-
 }  // namespace
 
 void FillCudaRegistry() { FillRegistry(DeviceFramework::kCuda); }
@@ -108,7 +115,8 @@ bool isRegistered(const WideString& key, const Kiln::DeviceRef& device) {
 
 RenderNodeRef createNode(const WideString& key, const Kiln::DeviceRef& device, const VideoNodeRef& description,
                          const RenderRequirements& requirements, bool& host) {
-    if (key != kHostRenderSourceKey && key != kBlackVideoSourceKey && IsOversized(requirements.frameRect, *device)) {
+    if (key != kHostRenderSourceKey && key != kBlackVideoSourceKey &&
+        ExceedsDeviceMemory(requirements.frameRect, *device)) {
         host = true;
         return {};
     }
