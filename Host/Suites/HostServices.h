@@ -16,6 +16,7 @@
 namespace Vantrel::Host {
 
 class NodeTable;
+class OpaqueDataTable;
 class SegmentListTable;
 
 /// What stands behind the host's suites. Their entries are plain functions without a context, so there is one of it in
@@ -43,6 +44,7 @@ public:
     [[nodiscard]] IdentityBook& GetIdentities() { return mIdentities; }
     [[nodiscard]] NodeTable& GetNodes() { return *mNodes; }
     [[nodiscard]] SegmentListTable& GetSegmentLists() { return *mSegmentLists; }
+    [[nodiscard]] OpaqueDataTable& GetOpaqueData() { return *mOpaqueData; }
     /// What a node id stands for; null for an id that isn't held.
     [[nodiscard]] NodePtr FindNode(std::uint32_t nodeID) const;
     [[nodiscard]] MediaClipPtr FindClip(std::uint32_t clipID) const { return mIdentities.FindClip(clipID); }
@@ -57,6 +59,7 @@ private:
     IdentityBook mIdentities;
     std::unique_ptr<NodeTable> mNodes;
     std::unique_ptr<SegmentListTable> mSegmentLists;
+    std::unique_ptr<OpaqueDataTable> mOpaqueData;
     SnapshotPtr mSnapshot;
     std::map<std::pair<std::string, std::int32_t>, const void*> mSuites;
 };

@@ -19,7 +19,7 @@ constexpr std::uint64_t kOwnPagesFrom = 2U << 20;
 void CL_CALLBACK ReleasePages(cl_mem /*buffer*/, void* pages) { PagesDeleter()(pages); }
 
 // A thread of a gather kernel takes a run of pixels; on a CPU it fills the vectors.
-constexpr const char* kGPUOptions = "-cl-std=CL1.2 -D OPENCL_LANES=1";
+constexpr const char* kGPUOptions = "-cl-std=CL1.2";
 constexpr const char* kCPUOptions = "-cl-std=CL1.2 -D OPENCL_LANES=16";
 
 }  // namespace
