@@ -56,6 +56,9 @@ struct FakeNode {
         std::int64_t offset = 0;
     };
 
+    FakeNode() = default;
+    FakeNode(std::string nodeKind) : kind(std::move(nodeKind)) {}
+
     std::string kind;  ///< "Clip", "Media", ...: made into the host's text; any other text goes out as it is
     Guid hash{};
     std::uint32_t flags = 0;

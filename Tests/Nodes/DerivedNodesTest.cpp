@@ -1,0 +1,244 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include <gmock/gmock.h>
+
+#include "Src/Nodes/MultipleTimeInputBaseNode.h"
+#include "Src/Nodes/ProxyNode.h"
+#include "Src/Nodes/SelectInputBaseNode.h"
+#include "Src/Nodes/SourceBaseNode.h"
+#include "Src/Nodes/TransformIndividualInputRenderParamsBaseNode.h"
+#include "Src/Nodes/TransformRenderParamsBaseNode.h"
+#include "Src/VideoNodes/VideoNodeFactory.h"
+#include "Tests/Nodes/ProbeNodes.h"
+#include "Tests/Support/HostedTest.h"
+
+namespace Vantrel::Testing {
+namespace {
+
+using ::testing::ElementsAre;
+
+/// A concrete node of a derived base: its counter, and a Render with nothing to do.
+template <class Base>
+class Concrete : public Base, public Ostrand::Allocated<Concrete<Base>> {
+public:
+    Concrete() : Base(false, false) {}
+    Status Render(const RenderToken&, const RenderParams&, const RenderResultsRef&) override { return 0; }
+
+protected:
+    std::atomic<std::int32_t>& GetRef() override { return this->mRefCount; }
+};
+
+class Aligned final : public Concrete<TransformRenderParamsBaseNode> {
+public:
+    void TransformParams(RenderParams& out, const RenderParams& params) override {
+        out.time = params.time / 100 * 100;
+        out.clipTime = params.clipTime / 100 * 100;
+    }
+};
+
+TEST(TransformRenderParams, EveryPhaseAndTheFingerprintSeeTheTransformedParams) {
+    ProbeStage stage;
+    const auto node = stage.Configured(InterfaceRef<Aligned>(new Aligned));
+    const ProbeLeafRef leaf = stage.Leaf("leaf");
+    leaf->frame = FakeFrame::Make();
+    node->SetInput(0, leaf);
+    stage.params.time = stage.params.clipTime = 250;
+    stage.results->StoreHash(node.Get(), 200, HashOf(1));
+    EXPECT_EQ(node->GetFrameHash(stage.params, stage.results), HashOf(1));
+    VideoFrameRef frame;
+    EXPECT_EQ(stage.Render(*node, frame), 0);
+    EXPECT_EQ(leaf->lastParams.time, 200);
+    EXPECT_EQ(stage.results->FindFrame(HashOf(1)), leaf->frame);
+    node->RequestHostFrames(stage.params, stage.results);
+    node->CancelHostFrames(stage.params, stage.results);
+    node->BeginUpload({}, stage.params, stage.results, true, frame);
+    node->FetchHostFrame({}, stage.params, stage.results, true, frame);
+    node->CollectHostFrames(stage.params, stage.results, {});
+    node->EndFrame({}, stage.params, stage.results, 0);
+    EXPECT_EQ(stage.log.size(), 7U);
+    EXPECT_EQ(leaf->lastParams.clipTime, 200);
+    EXPECT_FALSE(stage.results->FindFrame(HashOf(1)));
+}
+
+class Spread final : public Concrete<TransformIndividualInputRenderParamsBaseNode> {
+public:
+    void TransformParamsForInput(RenderParams& out, const RenderParams& params, std::size_t index) override {
+        out.time = params.time + static_cast<std::int64_t>(index);
+    }
+};
+
+TEST(TransformIndividualInputRenderParams, EachInputHasItsOwnParams) {
+    ProbeStage stage;
+    const auto node = stage.Configured(InterfaceRef<Spread>(new Spread));
+    const ProbeLeafRef first = stage.Leaf("first");
+    const ProbeLeafRef last = stage.Leaf("last");
+    node->SetInput(0, first);
+    node->SetInput(2, last);
+    stage.params.time = 10;
+    EXPECT_EQ(node->RequestHostFrames(stage.params, stage.results), 0);
+    EXPECT_EQ(first->lastParams.time, 10);
+    EXPECT_EQ(last->lastParams.time, 12);
+    stage.TakeLog();
+    first->status = Ostrand::kStatus_Failure;
+    VideoFrameRef frame;
+    EXPECT_EQ(stage.Render(*node, frame), Ostrand::kStatus_Failure);
+    EXPECT_EQ(node->EndFrame({}, stage.params, stage.results, 3), 0);
+    EXPECT_THAT(stage.log, ElementsAre("first RenderFrame", "first EndFrame 3", "last EndFrame 3"));
+}
+
+class Chooser final : public SelectInputBaseNode, public Ostrand::Allocated<Chooser> {
+public:
+    Chooser() : SelectInputBaseNode(true, false) {}
+    void SelectInput(RenderParams& out, const RenderParams& params, RenderNodeRef& input) override {
+        out.time = params.time + 5;
+        input = chosen;
+    }
+    RenderNodeRef chosen;
+    using SelectInputBaseNode::mFrameSlot;
+
+protected:
+    std::atomic<std::int32_t>& GetRef() override { return mRefCount; }
+};
+
+TEST(SelectInput, ThePictureComesFromTheChoice) {
+    ProbeStage stage;
+    const auto node = stage.Configured(InterfaceRef<Chooser>(new Chooser));
+    const ProbeLeafRef leaf = stage.Leaf("leaf");
+    leaf->frame = FakeFrame::Make();
+    node->chosen = leaf;
+    VideoFrameRef frame;
+    EXPECT_EQ(stage.Render(*node, frame), 0);
+    EXPECT_EQ(frame, leaf->frame);
+    EXPECT_EQ(leaf->lastParams.time, 5);
+    leaf->status = Ostrand::kStatus_OutOfMemory;
+    EXPECT_EQ(stage.Render(*node, frame), Ostrand::kStatus_OutOfMemory);
+    EXPECT_EQ(stage.device->DeviceMemory().releases.size(), 1U);
+    EXPECT_FALSE(node->mFrameSlot);
+    EXPECT_THAT(stage.log, ElementsAre("leaf RenderFrame", "leaf RenderFrame", "leaf RenderFrame"));
+
+    node->chosen.Reset();
+    EXPECT_EQ(node->Render({}, stage.params, stage.results), 0);
+    EXPECT_THROW(node->RequestHostFrames(stage.params, stage.results), Ostrand::NullInterfaceException);
+}
+
+class Sampler final : public Concrete<MultipleTimeInputBaseNode> {
+public:
+    void GetInputTimes(const RenderParams&, SampleSet& times, bool) override { times = samples; }
+    SampleSet samples;
+};
+
+TEST(MultipleTimeInput, EveryPhaseGoesThroughAllSamplesAsFieldsOrFrames) {
+    ProbeStage stage;
+    const auto node = stage.Configured(InterfaceRef<Sampler>(new Sampler));
+    const ProbeLeafRef leaf = stage.Leaf("leaf");
+    node->SetInput(0, leaf);
+    stage.params.time = 5100;
+    stage.params.clipTime = 100;
+    const auto ask = [&](const SampleSet& samples) {
+        node->samples = samples;
+        node->RequestHostFrames(stage.params, stage.results);
+        return leaf->lastParams;
+    };
+    EXPECT_EQ(ask({{2000, {{2000}}}}).fieldSelection, Vellum::kFieldSelection_First);
+    EXPECT_EQ(ask({{2000, {{2500}}}}).fieldSelection, Vellum::kFieldSelection_Second);
+    EXPECT_EQ(ask({{2000, {{2000}, {2500}}}}).fieldSelection, Vellum::kFieldSelection_Frame);
+    EXPECT_EQ(ask({{2000, {{2500}}}}).clipTime, 2000);
+    EXPECT_EQ(leaf->lastParams.time, 7000);
+
+    node->samples = {{1000, {{1000}}}, {2000, {{2000}}}};
+    leaf->status = Ostrand::kStatus_Failure;
+    stage.TakeLog();
+    EXPECT_EQ(node->CollectHostFrames(stage.params, stage.results, {}), Ostrand::kStatus_Failure);
+    EXPECT_EQ(node->EndFrame({}, stage.params, stage.results, 2), 0);
+    EXPECT_THAT(stage.log, ElementsAre("leaf CollectHostFrames", "leaf EndFrame 2", "leaf EndFrame 2"));
+}
+
+class Link : public SourceBaseNode<FilterNode>, public Ostrand::Allocated<Link> {
+protected:
+    std::atomic<std::int32_t>& GetRef() override { return mRefCount; }
+};
+
+class ProgressiveLink final : public Link {
+public:
+    Vellum::FrameRate GetFieldRate() override { return GetFrameRate(); }
+};
+
+class SourceChainTest : public HostedTest {
+protected:
+    VideoNodeRef Media(const char* fieldType) {
+        host.nodes[1].kind = "Clip";
+        host.nodes[1].inputs = {{2}};
+        host.nodes[2].kind = "Media";
+        host.nodes[2].properties = {{"MediaNode::StreamFrameRate", "1000"}, {"MediaNode::StreamFieldType", fieldType}};
+        host.sequences[9].segments = {{0, 10, 0, {1, 2, 3, {}}, 1}};
+        const VideoSegmentsHandle handle(9, SegmentsMode::kPlain, "");
+        return GetClipMedia(AcquireRootNode(handle, 0));
+    }
+    ProbeStage stage;
+};
+
+TEST_F(SourceChainTest, RatesComeFromTheLastLinkWhichReadsTheMedia) {
+    const struct {
+        const char* fieldType;
+        std::int64_t frameTicks;
+        std::int64_t fieldTicks;
+    } kCases[] = {{"0", 1000, 1000}, {"1", 1000, 500}, {"2", 1000, 500}, {"4", 2000, 2000}};
+    for (const auto& expected : kCases) {
+        const auto last = stage.Configured(InterfaceRef<Link>(new Link), Media(expected.fieldType));
+        const InterfaceRef<Link> middle(new Link);
+        const InterfaceRef<ProgressiveLink> head(new ProgressiveLink);
+        last->SetInput(0, stage.Leaf("producer"));
+        middle->SetInput(0, last);
+        head->SetInput(0, middle);
+        EXPECT_EQ(middle->GetFrameRate().GetTicksPerFrame(), expected.frameTicks) << expected.fieldType;
+        EXPECT_EQ(middle->GetFieldRate().GetTicksPerFrame(), expected.fieldTicks) << expected.fieldType;
+        EXPECT_EQ(head->GetFieldRate(), head->GetFrameRate()) << "no fields leave this link";
+        EXPECT_TRUE(head->GetFrameHash(stage.params, stage.results).IsNil());
+        const auto asSource = Ostrand::Query<ISourceNode>(RenderNodeRef(head));
+        EXPECT_EQ(Ostrand::Query<IRenderNode>(asSource).Get(), static_cast<IRenderNode*>(head.Get()));
+    }
+}
+
+class InnerNode final : public Concrete<FilterNode> {
+public:
+    Status Configure(const VideoNodeRef& description, const RenderRequirements& requirements, bool& host) override {
+        if (requirements.frameTicks == 0) return Ostrand::kStatus_Failure;
+        return FilterNode::Configure(description, requirements, host);
+    }
+};
+
+class OuterNode : public FilterNode {
+public:
+    OuterNode() : FilterNode(false, false) {}
+    Status Configure(const VideoNodeRef& description, const RenderRequirements& requirements, bool& host) override {
+        configured = true;
+        return FilterNode::Configure(description, requirements, host);
+    }
+    Status Render(const RenderToken&, const RenderParams&, const RenderResultsRef&) override { return 0; }
+    bool configured = false;
+};
+
+TEST(ProxyNode, ConfiguresTheInnerNodeFirstAndHandsInputsDown) {
+    ProbeStage stage;
+    using Proxy = ProxyNode<OuterNode, InnerNode>;
+    const InterfaceRef<Proxy> failing(new Proxy);
+    EXPECT_THROW(failing->SetInput(0, stage.Leaf("early")), Ostrand::NullInterfaceException);
+    RenderRequirements requirements = stage.Requirements();
+    requirements.frameTicks = 0;
+    bool host = false;
+    EXPECT_EQ(failing->Configure({}, requirements, host), Ostrand::kStatus_Failure);
+    EXPECT_FALSE(failing->configured);
+    EXPECT_FALSE(failing->GetInput(0));
+
+    const auto proxy = stage.Configured(InterfaceRef<Proxy>(new Proxy));
+    const ProbeLeafRef leaf = stage.Leaf("leaf");
+    proxy->SetInput(0, leaf);
+    const auto inner = Ostrand::Query<FilterNode>(proxy->GetInput(0));
+    ASSERT_TRUE(inner);
+    EXPECT_EQ(inner->GetInput(0), RenderNodeRef(leaf));
+    EXPECT_EQ(proxy->GetInputCount(), 1U);
+    EXPECT_TRUE(Ostrand::Query<FilterNode>(proxy));
+}
+
+}  // namespace
+}  // namespace Vantrel::Testing
