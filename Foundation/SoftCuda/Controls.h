@@ -25,6 +25,12 @@ void SoftCudaSetFailEvery(unsigned n);
 /// start.
 void SoftCudaSetFusing(int on);
 
+/// Lets at most so many threads work on a kernel. SOFTCUDA_THREADS sets it from the start.
+void SoftCudaSetThreads(unsigned threads);
+
+/// Why the last failing call on this thread failed, where the code alone doesn't tell. Valid until the next call.
+const char* SoftCudaGetMessage(void);
+
 void SoftCudaGetCounters(SoftCudaCounters* counters);
 
 /// One line on the driver: threads, instruction-set level, memory, fusing. Valid for the life of the process.
