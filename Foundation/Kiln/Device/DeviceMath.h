@@ -33,12 +33,12 @@ DEVICE_FUNCTION float Exp2(float x) {
     const float bounded = Clamp(x, -126.0f, 127.99999f);
     const float whole = Floor(bounded + 0.5f);
     const float f = bounded - whole;
-    float p = 1.5403530e-4f;
-    p = p * f + 1.3333558e-3f;
-    p = p * f + 9.6181291e-3f;
-    p = p * f + 5.5504109e-2f;
-    p = p * f + 2.4022651e-1f;
-    p = p * f + 6.9314718e-1f;
+    float p = 1.5353362e-4f;
+    p = p * f + 1.3398874e-3f;
+    p = p * f + 9.6184374e-3f;
+    p = p * f + 5.5503325e-2f;
+    p = p * f + 2.4022648e-1f;
+    p = p * f + 6.9314720e-1f;
     p = p * f + 1.0f;
     // The scale is applied in two steps because 2^128 alone isn't a number that a float holds.
     const int first = (int)whole >> 1;
@@ -78,7 +78,7 @@ DEVICE_FUNCTION float Exp(float x) {
 }
 DEVICE_FUNCTION float Log(float x) { return Log2(x) * 0.69314718f; }
 
-/// For colour: a base at or below 0 gives 0 (1 for exponent 0, infinity for a negative one). The relative error is 3e-7
+/// For colour: a base at or below 0 gives 0 (1 for exponent 0, infinity for a negative one). The relative error is 4e-7
 /// while the result lies between 1/16 and 16 and grows with the logarithm of the result.
 DEVICE_FUNCTION float Pow(float base, float exponent) {
     const float power = Exp2(exponent * Log2(base));

@@ -1,0 +1,359 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+
+// Kernels of each shape against plain loops in double precision, on every instruction-set level.
+
+#include <algorithm>
+#include <cmath>
+#include <limits>
+
+#include "Kiln/Device/TextureDescriptor.h"
+#include "Tests/SoftCuda/DriverFixture.h"
+
+namespace SoftCudaTest {
+
+namespace {
+
+constexpr float kNaN = std::numeric_limits<float>::quiet_NaN();
+constexpr float kInfinity = std::numeric_limits<float>::infinity();
+
+/// What a kernel is compared with: made from the pixel's place by a function.
+template <class Function>
+std::vector<Pixel> MakePixels(int width, int height, int format, const Function& function) {
+    std::vector<Pixel> pixels;
+    for (int y = 0; y < height; ++y)
+        for (int x = 0; x < width; ++x) {
+            Pixel pixel;
+            for (int c = 0; c < 4; ++c) {
+                const auto value = static_cast<float>(function(x, y, c));
+                pixel.value[c] = format == 0 ? RoundToHalf(value) : value;
+            }
+            pixels.push_back(pixel);
+        }
+    return pixels;
+}
+
+// Half a step of the format, and for 32 bits a few roundings.
+double GetRelative(int format) { return format == 0 ? 1.0 / 1024 : 1e-6; }
+
+}  // namespace
+
+class KernelTest : public DriverTest, public ::testing::WithParamInterface<const char*> {
+protected:
+    void SetUp() override { Open(GetParam()); }
+
+    /// Runs `check(width, height, format, pitch)` over sizes around the strips' and lanes' and both formats.
+    template <class Check>
+    void ForShapes(const Check& check) {
+        constexpr std::pair<int, int> kSizes[] = {{1, 1}, {15, 2}, {17, 3}, {255, 4}, {261, 2}, {700, 37}};
+        for (const auto& [width, height] : kSizes)
+            for (int format = 0; format < 2; ++format) {
+                SCOPED_TRACE(std::to_string(width) + " by " + std::to_string(height) + ", format " +
+                             std::to_string(format));
+                check(width, height, format, width + width % 3);
+            }
+    }
+
+    std::mt19937 mRandom{20};
+};
+
+TEST_P(KernelTest, PointwiseKernelsMatchPlainLoopsAndLeaveTheRestAlone) {
+    ForShapes([&](int width, int height, int format, int pitch) {
+        DeviceFrame in(width, height, pitch, format), out(width, height, pitch + 2, format);
+        in.Write(RandomPixels(static_cast<std::size_t>(width * height), mRandom));
+        const std::vector<Pixel> source = in.Read();
+        const auto at = [&](int x, int y, int c) { return source[static_cast<std::size_t>(y * width + x)].value[c]; };
+        ASSERT_EQ(Launch("InvertKernel", width, height,
+                         Arguments(format, out.data, width, height, out.pitch, in.data, in.pitch, 0.25F)),
+                  CUDA_SUCCESS);
+        const auto expected = MakePixels(width, height, format, [&](int x, int y, int c) {
+            const double value = at(x, y, c);
+            return c == 3 ? value : (1.0 - value) * 0.75 + value * 0.25;
+        });
+        ExpectNear(out.Read(), expected, GetRelative(format), 1e-6, width);
+
+        std::vector<unsigned char> bytes = out.ReadBytes();
+        const std::size_t pixel = format == 0 ? 8 : 16;
+        for (int y = 0; y < height; ++y) {
+            const auto* padding = &bytes[static_cast<std::size_t>(y * out.pitch + width) * pixel];
+            EXPECT_TRUE(std::all_of(padding, padding + 2 * pixel, [](unsigned char byte) { return byte == 0x5A; }));
+        }
+
+        ASSERT_EQ(Launch("RampKernel", width, height,
+                         Arguments(out.data, out.pitch, format, width, height, Pixel{{0.5F, 2.0F, -1.0F, 0.5F}})),
+                  CUDA_SUCCESS);
+        ExpectNear(out.Read(),
+                   MakePixels(width, height, format,
+                              [](int x, int y, int c) {
+                                  const double ramp[] = {x * 0.5, y * 2.0, -1.0, 0.5};
+                                  return ramp[c];
+                              }),
+                   0, 0, width);
+    });
+}
+
+TEST_P(KernelTest, CopyingKeepsEveryHalfAndEveryFloat) {
+    DeviceFrame in(256, 64, 256, 0), out(256, 64, 256, 0);
+    std::vector<unsigned char> bytes(256 * 64 * 8);
+    for (std::size_t i = 0; i < bytes.size() / 2; ++i) {
+        // A signalling NaN comes out quiet, so its quiet form goes in.
+        auto half = static_cast<std::uint16_t>(i);
+        if ((half & 0x7C00U) == 0x7C00U && (half & 0x3FFU) != 0) half |= 0x200U;
+        std::memcpy(&bytes[2 * i], &half, 2);
+    }
+    in.WriteBytes(bytes);
+    const auto copy = [&](const DeviceFrame& target, const DeviceFrame& source) {
+        ASSERT_EQ(Launch("CopyKernel", source.width, source.height,
+                         Arguments(source.format, target.data, source.width, source.height, target.pitch, source.data,
+                                   source.pitch)),
+                  CUDA_SUCCESS);
+    };
+    copy(out, in);
+    EXPECT_EQ(out.ReadBytes(), bytes);
+
+    DeviceFrame floats(31, 3, 31, 1), copied(31, 3, 31, 1);
+    std::vector<Pixel> pixels = RandomPixels(93, mRandom, -1e30F, 1e30F);
+    pixels[5].value[0] = kInfinity;
+    pixels[40].value[3] = -kInfinity;
+    floats.Write(pixels);
+    copy(copied, floats);
+    EXPECT_EQ(copied.ReadBytes(), floats.ReadBytes());
+}
+
+TEST_P(KernelTest, GatherKernelsMatchPlainLoops) {
+    ForShapes([&](int width, int height, int format, int pitch) {
+        DeviceFrame in(width, height, pitch, format), out(width, height, pitch, format);
+        in.Write(RandomPixels(static_cast<std::size_t>(width * height), mRandom));
+        const std::vector<Pixel> source = in.Read();
+        const auto at = [&](int x, int y, int c) {
+            const int column = std::clamp(x, 0, width - 1), row = std::clamp(y, 0, height - 1);
+            return static_cast<double>(source[static_cast<std::size_t>(row * width + column)].value[c]);
+        };
+        ASSERT_EQ(Launch("ShiftKernel", width, height,
+                         Arguments(format, in.data, in.pitch, out.data, out.pitch, width, height, -3.25F)),
+                  CUDA_SUCCESS);
+        ExpectNear(out.Read(),
+                   MakePixels(width, height, format,
+                              [&](int x, int y, int c) { return at(x - 4, y, c) * 0.25 + at(x - 3, y, c) * 0.75; }),
+                   GetRelative(format), 1e-6, width);
+
+        ASSERT_EQ(Launch("SmoothKernel", width, height,
+                         Arguments(format, in.data, in.pitch, out.data, out.pitch, width, height)),
+                  CUDA_SUCCESS);
+        ExpectNear(out.Read(),
+                   MakePixels(width, height, format,
+                              [&](int x, int y, int c) {
+                                  return at(x, y - 1, c) * 0.25 + at(x, y, c) * 0.5 + at(x, y + 1, c) * 0.25;
+                              }),
+                   GetRelative(format), 1e-6, width);
+    });
+}
+
+TEST_P(KernelTest, PassesDownTheColumnsMatchPlainLoops) {
+    constexpr int kColumns = 101, kRows = 40, kPitch = 104;
+    DeviceFrame in(kPitch / 4, kRows, kPitch / 4, 1), out(kPitch / 4, kRows, kPitch / 4, 1);
+    in.Write(RandomPixels(kPitch / 4 * kRows, mRandom));
+    CUfunction function = Find("ColumnKernel");
+    int pitch = kPitch, columns = kColumns, rows = kRows;
+    float factor = 0.75F;
+    CUdeviceptr source = in.data, target = out.data;
+    void* parameters[] = {&source, &target, &pitch, &columns, &rows, &factor};
+    ASSERT_EQ(Api().cuLaunchKernel(function, 1, 1, 1, 128, 1, 1, 0, nullptr, parameters, nullptr), CUDA_SUCCESS);
+    const auto values = in.Read(), results = out.Read();
+    for (int x = 0; x < kPitch; ++x) {
+        double state = 0;
+        for (int y = 0; y < kRows; ++y) {
+            const auto i = static_cast<std::size_t>(y * kPitch + x);
+            state = state * 0.75 + values[i / 4].value[i % 4];
+            if (x < kColumns) {
+                EXPECT_NEAR(results[i / 4].value[i % 4], state, 1e-5) << x << ", " << y;
+            }
+        }
+    }
+}
+
+TEST_P(KernelTest, BytesGoThroughFramesUnchanged) {
+    constexpr int kWidth = 61, kHeight = 17;
+    std::vector<unsigned char> bytes(kWidth * kHeight * 4);
+    for (std::size_t i = 0; i < bytes.size(); ++i) bytes[i] = static_cast<unsigned char>(i * 7 + i / 256);
+    CUdeviceptr packed = 0;
+    ASSERT_EQ(Api().cuMemAlloc_v2(&packed, bytes.size()), CUDA_SUCCESS);
+    for (int format = 0; format < 2; ++format) {
+        DeviceFrame frame(kWidth, kHeight, kWidth + 3, format);
+        ASSERT_EQ(Api().cuMemcpyHtoD_v2(packed, bytes.data(), bytes.size()), CUDA_SUCCESS);
+        ASSERT_EQ(Launch("UnpackKernel", kWidth, kHeight,
+                         Arguments(packed, kWidth, frame.data, frame.pitch, format, kWidth, kHeight)),
+                  CUDA_SUCCESS);
+        EXPECT_NEAR(frame.Read()[1].value[0], bytes[4] / 255.0, 1e-3);
+        ASSERT_EQ(Api().cuMemsetD8_v2(packed, 0, bytes.size()), CUDA_SUCCESS);
+        ASSERT_EQ(Launch("PackKernel", kWidth, kHeight,
+                         Arguments(frame.data, frame.pitch, format, packed, kWidth, kWidth, kHeight)),
+                  CUDA_SUCCESS);
+        std::vector<unsigned char> back(bytes.size());
+        ASSERT_EQ(Api().cuMemcpyDtoH_v2(back.data(), packed, back.size()), CUDA_SUCCESS);
+        EXPECT_EQ(back, bytes);
+    }
+    EXPECT_EQ(Api().cuMemFree_v2(packed), CUDA_SUCCESS);
+}
+
+/// The functions of a device file at work, against the C library in double precision.
+class MathTest : public KernelTest {
+protected:
+    std::vector<float> Run(int function, const std::vector<float>& a, const std::vector<float>& b) const {
+        const std::size_t bytes = a.size() * sizeof(float);
+        CUdeviceptr memory[3] = {};
+        for (CUdeviceptr& block : memory) EXPECT_EQ(Api().cuMemAlloc_v2(&block, bytes), CUDA_SUCCESS);
+        EXPECT_EQ(Api().cuMemcpyHtoD_v2(memory[0], a.data(), bytes), CUDA_SUCCESS);
+        EXPECT_EQ(Api().cuMemcpyHtoD_v2(memory[1], b.data(), bytes), CUDA_SUCCESS);
+        const int count = static_cast<int>(a.size());
+        EXPECT_EQ(Launch("MathKernel", count, 1, Arguments(function, memory[0], memory[1], memory[2], count)),
+                  CUDA_SUCCESS);
+        std::vector<float> out(a.size());
+        EXPECT_EQ(Api().cuMemcpyDtoH_v2(out.data(), memory[2], bytes), CUDA_SUCCESS);
+        for (const CUdeviceptr block : memory) EXPECT_EQ(Api().cuMemFree_v2(block), CUDA_SUCCESS);
+        return out;
+    }
+};
+
+TEST_P(MathTest, FunctionsStayWithinTheirStatedErrors) {
+    struct Case {
+        int function;
+        const char* name;
+        double (*reference)(double, double);
+        float lowA, highA, lowB, highB;
+        double relative, absolute;
+    };
+    const Case cases[] = {
+        {0, "Exp2", [](double a, double) { return std::exp2(a); }, -125, 127, 0, 1, 1.8e-7, 0},
+        {1, "Log2", [](double a, double) { return std::log2(a); }, 1e-30F, 1e4F, 0, 1, 2.4e-7, 1e-7},
+        {1, "Log2 near 1", [](double a, double) { return std::log2(a); }, 0.7F, 1.5F, 0, 1, 2.4e-7, 1e-7},
+        {2, "Pow", [](double a, double b) { return std::pow(a, b); }, 0.12F, 3, 0.2F, 1.3F, 4e-7, 0},
+        {3, "Exp", [](double a, double) { return std::exp(a); }, -80, 80, 0, 1, 3e-7, 0},
+        {4, "Log", [](double a, double) { return std::log(a); }, 1e-5F, 100, 0, 1, 3e-7, 1e-7},
+        {5, "Sin", [](double a, double) { return std::sin(a); }, -8000, 8000, 0, 1, 0, 2e-7},
+        {6, "Cos", [](double a, double) { return std::cos(a); }, -8000, 8000, 0, 1, 0, 2e-7},
+        {7, "Atan2", [](double a, double b) { return std::atan2(a, b); }, -5, 5, -5, 5, 0, 4e-7},
+        {11, "Sqrt", [](double a, double) { return std::sqrt(a); }, 0, 1e6F, 0, 1, 6e-8, 0},
+        {12, "Floor", [](double a, double) { return std::floor(a); }, -1e4F, 1e4F, 0, 1, 0, 0},
+    };
+    for (const Case& each : cases) {
+        std::uniform_real_distribution<float> da(each.lowA, each.highA), db(each.lowB, each.highB);
+        std::vector<float> a(20000), b(a.size());
+        for (float& value : a) value = da(mRandom);
+        for (float& value : b) value = db(mRandom);
+        const std::vector<float> out = Run(each.function, a, b);
+        double worst = 0;
+        std::size_t where = 0;
+        for (std::size_t i = 0; i < a.size(); ++i) {
+            const double want = each.reference(a[i], b[i]);
+            const double error = std::abs(out[i] - want) - each.absolute - each.relative * std::abs(want);
+            if (!(error <= worst)) worst = error, where = i;
+        }
+        EXPECT_EQ(worst, 0) << each.name << "(" << a[where] << ", " << b[where] << ") gave " << out[where] << ", not "
+                            << each.reference(a[where], b[where]);
+    }
+}
+
+TEST_P(MathTest, EdgesAreAsWrittenDown) {
+    struct Case {
+        int function;
+        float a, b, result;
+    };
+    const Case cases[] = {
+        {0, 128, 0, kInfinity},
+        {0, -127, 0, 0},
+        {0, 0, 0, 1},
+        {0, kNaN, 0, kNaN},
+        {1, 0, 0, -kInfinity},
+        {1, 1, 0, 0},
+        {1, kInfinity, 0, kInfinity},
+        {1, -1, 0, kNaN},
+        {2, 0, 0.5F, 0},
+        {2, -3, 2, 0},
+        {2, 0, 0, 1},
+        {2, 0, -1, kInfinity},
+        {2, 1, 77, 1},
+        {2, kNaN, 1, kNaN},
+        {5, 0, 0, 0},
+        {7, 0, 0, 0},
+        // The second operand is the result where one is not a number.
+        {8, kNaN, 3, 3},
+        {8, 3, kNaN, kNaN},
+        {9, kNaN, 3, 3},
+        {9, 3, kNaN, kNaN},
+        {8, 1, 2, 1},
+        {9, 1, 2, 2},
+        {10, kNaN, 0, 0},
+        {10, 7, 0, 1},
+        {10, -kInfinity, 0, 0},
+        {13, -1, 4, 3},
+        {13, 9, 4, 1},
+    };
+    for (const Case& each : cases) {
+        const float got = Run(each.function, {each.a}, {each.b})[0];
+        const bool same = std::isnan(each.result) ? std::isnan(got) : got == each.result;
+        EXPECT_TRUE(same) << "function " << each.function << "(" << each.a << ", " << each.b << ") gave " << got;
+    }
+}
+
+/// Textures through their descriptor; lanes and single samples have to agree.
+TEST_P(KernelTest, TexturesAreSampledAsTheirDescriptorSays) {
+    constexpr int kWidth = 37, kHeight = 11;
+    DeviceFrame in(kWidth, kHeight, kWidth, 1), out(kWidth, kHeight, kWidth, 1), single(kWidth, kHeight, kWidth, 1);
+    std::vector<Pixel> pixels = RandomPixels(kWidth * kHeight, mRandom, 0, 1);
+    pixels[3 * kWidth + 5] = {{9, 9, 9, 0}};  // bright, but not there: it must not bleed
+    in.Write(pixels);
+    CUdeviceptr descriptorMemory = 0;
+    ASSERT_EQ(Api().cuMemAlloc_v2(&descriptorMemory, sizeof(TextureDescriptor)), CUDA_SUCCESS);
+
+    const auto index = [](int i, int size, int mode) {
+        if (mode == TEXTURE_ADDRESS_CLAMP) return std::clamp(i, 0, size - 1);
+        if (mode == TEXTURE_ADDRESS_BORDER) return i < 0 || i >= size ? -1 : i;
+        while (i < 0) i += 2 * size;
+        if (mode == TEXTURE_ADDRESS_WRAP) return i % size;
+        return i % (2 * size) < size ? i % (2 * size) : 2 * size - 1 - i % (2 * size);
+    };
+    for (int mode = 0; mode < 4; ++mode)
+        for (int filter = 0; filter < 2; ++filter) {
+            SCOPED_TRACE("mode " + std::to_string(mode) + ", filter " + std::to_string(filter));
+            const TextureDescriptor descriptor = {in.data, kWidth, kHeight, kWidth, 1, mode, filter};
+            ASSERT_EQ(Api().cuMemcpyHtoD_v2(descriptorMemory, &descriptor, sizeof descriptor), CUDA_SUCCESS);
+            const Pixel matrix{{1.5F, -0.25F, 0.125F, 1.25F}};
+            const auto run = [&](const DeviceFrame& target, int lanesOff) {
+                ASSERT_EQ(
+                    Launch("SampleKernel", kWidth, kHeight,
+                           Arguments(descriptorMemory, target.data, kWidth, 1, kWidth, kHeight, matrix, lanesOff)),
+                    CUDA_SUCCESS);
+            };
+            run(out, 0);
+            run(single, 1);
+            const auto texel = [&](int x, int y, int c) -> double {
+                const int column = index(x, kWidth, mode), row = index(y, kHeight, mode);
+                return column < 0 || row < 0 ? 0 : pixels[static_cast<std::size_t>(row * kWidth + column)].value[c];
+            };
+            const auto expected = MakePixels(kWidth, kHeight, 1, [&](int x, int y, int c) {
+                const double u = (x + 0.5) * 1.5 - (y + 0.5) * 0.25, v = (x + 0.5) * 0.125 + (y + 0.5) * 1.25;
+                if (filter == TEXTURE_FILTER_POINT)
+                    return texel(static_cast<int>(std::floor(u)), static_cast<int>(std::floor(v)), c);
+                const double left = std::floor(u - 0.5), top = std::floor(v - 0.5);
+                double color = 0, alpha = 0;
+                for (int tap = 0; tap < 4; ++tap) {
+                    const int tx = static_cast<int>(left) + tap % 2, ty = static_cast<int>(top) + tap / 2;
+                    const double fx = u - 0.5 - left, fy = v - 0.5 - top;
+                    const double weight = (tap % 2 != 0 ? fx : 1 - fx) * (tap / 2 != 0 ? fy : 1 - fy);
+                    alpha += weight * texel(tx, ty, 3);
+                    color += weight * texel(tx, ty, 3) * texel(tx, ty, c);
+                }
+                return c == 3 ? alpha : alpha > 0 ? color / alpha : 0;
+            });
+            ExpectNear(out.Read(), expected, 1e-4, 1e-4, kWidth);
+            ExpectNear(single.Read(), expected, 1e-4, 1e-4, kWidth);
+        }
+    EXPECT_EQ(Api().cuMemFree_v2(descriptorMemory), CUDA_SUCCESS);
+}
+
+// A level that the processor lacks runs as the best one below it.
+INSTANTIATE_TEST_SUITE_P(Levels, KernelTest, ::testing::Values("v2", "v3", "v4"));
+INSTANTIATE_TEST_SUITE_P(Levels, MathTest, ::testing::Values("v2", "v3", "v4"));
+
+}  // namespace SoftCudaTest

@@ -1,0 +1,170 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+
+// Device memory: its size, its refusal, its copies and fills.
+
+#include <array>
+#include <numeric>
+
+#include "Tests/SoftCuda/DriverFixture.h"
+
+namespace SoftCudaTest {
+
+class MemoryTest : public DriverTest {
+protected:
+    /// Opens the driver anew with a memory of so many megabytes.
+    void Reopen(int megabytes) {
+        Close();
+        const ScopedVariable variable("SOFTCUDA_MEMORY_MB", std::to_string(megabytes));
+        Open("v4");
+    }
+    [[nodiscard]] static std::size_t GetFree() {
+        std::size_t free = 0, total = 0;
+        EXPECT_EQ(Api().cuMemGetInfo_v2(&free, &total), CUDA_SUCCESS);
+        return free;
+    }
+};
+
+TEST_F(MemoryTest, SizeIsAsSetAndWhatGoesBeyondIsRefused) {
+    Reopen(64);
+    std::size_t total = 0;
+    EXPECT_EQ(Api().cuDeviceTotalMem_v2(&total, 0), CUDA_SUCCESS);
+    EXPECT_EQ(total, 64U << 20);
+    EXPECT_EQ(GetFree(), total);
+
+    CUdeviceptr first = 0, second = 0;
+    ASSERT_EQ(Api().cuMemAlloc_v2(&first, 40U << 20), CUDA_SUCCESS);
+    EXPECT_EQ(first % (2U << 20), 0U);
+    EXPECT_EQ(GetFree(), 24U << 20);
+    EXPECT_EQ(Api().cuMemAlloc_v2(&second, 25U << 20), CUDA_ERROR_OUT_OF_MEMORY);
+    EXPECT_NE(std::string(Api().SoftCudaGetMessage()).find("device memory"), std::string::npos);
+    EXPECT_EQ(Api().cuMemFree_v2(first), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuMemFree_v2(first), CUDA_ERROR_INVALID_VALUE);
+    EXPECT_EQ(Api().cuMemAlloc_v2(&second, 64U << 20), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuMemAlloc_v2(&first, 0), CUDA_ERROR_INVALID_VALUE);
+
+    // What a context leaves behind goes with it.
+    Close();
+    Open("v4");
+    Reopen(64);
+    EXPECT_EQ(GetFree(), 64U << 20);
+    Reopen(4096);
+}
+
+TEST_F(MemoryTest, FailuresComeAsOftenAsAskedFor) {
+    Api().SoftCudaSetFailEvery(3);
+    std::vector<CUresult> results;
+    for (int i = 0; i < 7; ++i) {
+        CUdeviceptr block = 0;
+        results.push_back(Api().cuMemAlloc_v2(&block, 4096));
+        if (block != 0) {
+            EXPECT_EQ(Api().cuMemFree_v2(block), CUDA_SUCCESS);
+        }
+    }
+    Api().SoftCudaSetFailEvery(0);
+    constexpr CUresult kNo = CUDA_ERROR_OUT_OF_MEMORY, kYes = CUDA_SUCCESS;
+    EXPECT_EQ(results, (std::vector<CUresult>{kYes, kYes, kNo, kYes, kYes, kNo, kYes}));
+}
+
+TEST_F(MemoryTest, AddressesLeadToTheirBlock) {
+    CUdeviceptr block = 0, base = 0;
+    std::size_t pitch = 0, bytes = 0;
+    ASSERT_EQ(Api().cuMemAllocPitch_v2(&block, &pitch, 1000, 30, 16), CUDA_SUCCESS);
+    EXPECT_GE(pitch, 1000U);
+    EXPECT_EQ(pitch % 16, 0U);
+    EXPECT_EQ(Api().cuMemGetAddressRange_v2(&base, &bytes, block + 5000), CUDA_SUCCESS);
+    EXPECT_EQ(base, block);
+    EXPECT_EQ(bytes, pitch * 30);
+    EXPECT_EQ(Api().cuMemGetAddressRange_v2(&base, &bytes, block + pitch * 30), CUDA_ERROR_NOT_FOUND);
+    EXPECT_EQ(Api().cuMemcpyHtoD_v2(block + pitch * 30 - 4, &bytes, 8), CUDA_ERROR_INVALID_VALUE);
+    EXPECT_EQ(Api().cuMemFree_v2(block), CUDA_SUCCESS);
+}
+
+TEST_F(MemoryTest, CopiesOfRowsReachExactlyTheirRectangle) {
+    constexpr std::size_t kPitch = 160, kRows = 40;
+    std::vector<unsigned char> source(kPitch * kRows), result(kPitch * kRows);
+    std::iota(source.begin(), source.end(), static_cast<unsigned char>(3));
+    CUdeviceptr from = 0, to = 0;
+    ASSERT_EQ(Api().cuMemAlloc_v2(&from, source.size()), CUDA_SUCCESS);
+    ASSERT_EQ(Api().cuMemAlloc_v2(&to, source.size()), CUDA_SUCCESS);
+    ASSERT_EQ(Api().cuMemsetD8_v2(to, 0xEE, source.size()), CUDA_SUCCESS);
+    const auto copy = [](const void* sourceHost, CUdeviceptr sourceDevice, void* targetHost, CUdeviceptr targetDevice,
+                         std::size_t x) {
+        CUDA_MEMCPY2D rows = {};
+        rows.srcMemoryType = sourceHost != nullptr ? CU_MEMORYTYPE_HOST : CU_MEMORYTYPE_DEVICE;
+        rows.srcHost = sourceHost;
+        rows.srcDevice = sourceDevice;
+        rows.srcPitch = rows.dstPitch = kPitch;
+        rows.dstMemoryType = targetHost != nullptr ? CU_MEMORYTYPE_HOST : CU_MEMORYTYPE_DEVICE;
+        rows.dstHost = targetHost;
+        rows.dstDevice = targetDevice;
+        rows.srcXInBytes = rows.dstXInBytes = x;
+        rows.srcY = rows.dstY = x / 8;
+        rows.WidthInBytes = kPitch - 3 * x;
+        rows.Height = kRows - x / 4;
+        EXPECT_EQ(Api().cuMemcpy2D_v2(&rows), CUDA_SUCCESS);
+    };
+    copy(source.data(), 0, nullptr, from, 0);
+    copy(nullptr, from, nullptr, to, 16);
+    copy(nullptr, to, result.data(), 0, 0);
+    for (std::size_t y = 0; y < kRows; ++y)
+        for (std::size_t x = 0; x < kPitch; ++x) {
+            const bool inside = x >= 16 && x < 16 + kPitch - 48 && y >= 2 && y < 2 + kRows - 4;
+            ASSERT_EQ(result[y * kPitch + x], inside ? source[y * kPitch + x] : 0xEE) << x << ", " << y;
+        }
+    EXPECT_EQ(Api().cuMemFree_v2(from), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuMemFree_v2(to), CUDA_SUCCESS);
+}
+
+TEST_F(MemoryTest, FillsWriteTheirPattern) {
+    // Larger than a part of a fill, and no multiple of it.
+    constexpr std::size_t kWords = 150'001;
+    CUdeviceptr block = 0;
+    ASSERT_EQ(Api().cuMemAlloc_v2(&block, kWords * 4), CUDA_SUCCESS);
+    std::vector<unsigned> words(kWords);
+    const auto read = [&] { ASSERT_EQ(Api().cuMemcpyDtoH_v2(words.data(), block, kWords * 4), CUDA_SUCCESS); };
+    ASSERT_EQ(Api().cuMemsetD32_v2(block, 0x12345678, kWords), CUDA_SUCCESS);
+    read();
+    EXPECT_EQ(words, std::vector<unsigned>(kWords, 0x12345678));
+    ASSERT_EQ(Api().cuMemsetD16_v2(block, 0xABCD, 3), CUDA_SUCCESS);
+    ASSERT_EQ(Api().cuMemsetD2D32_v2(block + 40, 32, 7, 2, 2), CUDA_SUCCESS);
+    read();
+    EXPECT_EQ(words[0], 0xABCDABCDU);
+    EXPECT_EQ(words[1], 0x1234ABCDU);
+    const std::vector<unsigned> expected{7,          7,          0x12345678, 0x12345678, 0x12345678,
+                                         0x12345678, 0x12345678, 0x12345678, 7,          7};
+    EXPECT_EQ(std::vector<unsigned>(words.begin() + 10, words.begin() + 20), expected);
+    EXPECT_EQ(Api().cuMemsetD32_v2(block + 2, 0, 1), CUDA_ERROR_INVALID_VALUE);
+    EXPECT_EQ(Api().cuMemFree_v2(block), CUDA_SUCCESS);
+}
+
+TEST_F(MemoryTest, HostMemoryIsRegisteredOnce) {
+    std::array<char, 4096> memory{};
+    EXPECT_EQ(Api().cuMemHostRegister_v2(memory.data(), memory.size(), 0), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuMemHostRegister_v2(memory.data() + 100, 50, 0), CUDA_ERROR_HOST_MEMORY_ALREADY_REGISTERED);
+    EXPECT_EQ(Api().cuMemHostUnregister(memory.data()), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuMemHostUnregister(memory.data()), CUDA_ERROR_HOST_MEMORY_NOT_REGISTERED);
+    void* pinned = nullptr;
+    ASSERT_EQ(Api().cuMemHostAlloc(&pinned, 8 << 20, CU_MEMHOSTALLOC_PORTABLE), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuMemFreeHost(pinned), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuMemFreeHost(pinned), CUDA_ERROR_INVALID_VALUE);
+}
+
+TEST_F(MemoryTest, FramesOutsideLiveMemoryDontLaunch) {
+    DeviceFrame frame(32, 32, 32, 1);
+    const auto launch = [&](CUdeviceptr data, int pitch, int height) {
+        return Launch("GainKernel", 32, 32, Arguments(data, pitch, 1, 32, height, 1.0F, 0.0F));
+    };
+    EXPECT_EQ(launch(frame.data, 32, 32), CUDA_SUCCESS);
+    EXPECT_EQ(launch(frame.data + 16, 32, 32), CUDA_ERROR_ILLEGAL_ADDRESS);
+    EXPECT_NE(std::string(Api().SoftCudaGetMessage()).find("GainKernel, argument 1"), std::string::npos);
+    EXPECT_EQ(launch(frame.data, 33, 32), CUDA_ERROR_ILLEGAL_ADDRESS);
+    EXPECT_EQ(launch(frame.data, 16, 32), CUDA_ERROR_ILLEGAL_ADDRESS);
+    EXPECT_EQ(launch(0, 32, 32), CUDA_ERROR_ILLEGAL_ADDRESS);
+    EXPECT_EQ(launch(0, 32, 0), CUDA_SUCCESS);
+    // Only as many lines as the grid has threads for are touched.
+    EXPECT_EQ(launch(frame.data, 32, 1000), CUDA_SUCCESS);
+    Synchronize();
+}
+
+}  // namespace SoftCudaTest
