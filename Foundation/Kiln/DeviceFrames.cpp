@@ -3,15 +3,11 @@
 #include "Kiln/Backend.h"
 #include "Kiln/FrameCopies.h"
 #include "Kiln/FrameObject.h"
+#include "Kiln/Operations/Common.h"
 #include "Kiln/Scratch.h"
 
 namespace Kiln {
 namespace {
-
-bool IsRenderFormat(Vellum::PixelFormat format) {
-    return format == kPixelFormat_GPU_BGRA_4444_32f || format == kPixelFormat_GPU_BGRA_4444_16f ||
-           format == kPixelFormat_GPU_BGRX_4444_16f;
-}
 
 class DeviceFrame final : public FrameObject<IDeviceFrame, IOpaqueFill> {
 public:

@@ -35,7 +35,7 @@ private:
 void CopyRowsOnHost(const FrameAttributes& to, std::uint8_t* target, const FrameAttributes& from,
                     const std::uint8_t* source) {
     const std::size_t widthBytes = static_cast<std::size_t>(from.width) * Vellum::BytesPerPixel(from.format);
-    ForEachBand(from.height, 2 * widthBytes, [&](std::int32_t first, std::int32_t last) {
+    ForEachBand(from.height, 2 * widthBytes, 1, [&](std::int32_t first, std::int32_t last) {
         for (std::ptrdiff_t row = first; row < last; ++row) {
             std::memcpy(target + row * to.rowBytes, source + row * from.rowBytes, widthBytes);
         }

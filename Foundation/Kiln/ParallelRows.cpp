@@ -17,6 +17,8 @@ namespace {
 
 // Small enough to stay in a core's own cache, large enough that claiming one costs nothing beside it.
 constexpr std::uint64_t kBandBytes = 256U << 10;
+// Less than this is done before a helper has woken up.
+constexpr std::uint64_t kWorthHelp = 1U << 20;
 
 // Bands are claimed one by one. A helper that comes late finds none left and touches nothing but this record.
 struct Job {
@@ -57,13 +59,14 @@ const Helpers& GetHelpers() {
 
 }  // namespace
 
-void ForEachBand(std::int32_t rows, std::uint64_t rowCost,
+void ForEachBand(std::int32_t rows, std::uint64_t rowCost, std::int32_t fewestRows,
                  const std::function<void(std::int32_t first, std::int32_t last)>& work) {
     if (rows <= 0) return;
-    const auto rowsPerBand = static_cast<std::int32_t>(std::clamp<std::uint64_t>(
-        kBandBytes / std::max<std::uint64_t>(rowCost, 1), 1, static_cast<std::uint64_t>(rows)));
+    rowCost = std::max<std::uint64_t>(rowCost, 1);
+    const auto fullBand = static_cast<std::int32_t>(std::min<std::uint64_t>(kBandBytes / rowCost, 1U << 20));
+    const std::int32_t rowsPerBand = std::max({fullBand, fewestRows, 1});
     const std::int32_t bands = (rows + rowsPerBand - 1) / rowsPerBand;
-    if (bands < 4 || GetHelpers().empty()) {
+    if (bands < 2 || rowCost * static_cast<std::uint64_t>(rows) < kWorthHelp || GetHelpers().empty()) {
         work(0, rows);
         return;
     }
