@@ -1,0 +1,118 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include "Tests/Effects/EffectTester.h"
+
+#include <memory>
+#include <utility>
+
+#include <boost/make_shared.hpp>
+
+#include "Ostrand/QueryTable.h"
+#include "Src/Nodes/NodeRegistry.h"
+#include "Src/VideoNodes/VideoNodeFactory.h"
+#include "Vantrel/RenderSystem.h"
+
+namespace Vantrel::Testing {
+namespace {
+
+class PaddedFrame final : public Ostrand::Counted<PaddedFrame, Marl::IVideoFrame, Marl::IFrameIdentity,
+                                                  Marl::IFrameData, Marl::IFrameRows> {
+public:
+    PaddedFrame(std::unique_ptr<DevicePicture> picture, Vellum::PixelFormat format)
+        : mPicture(std::move(picture)), mFormat(format) {}
+
+    Status QueryInterface(const Guid& iid, void** out) override {
+        return Ostrand::QueryTable(this, iid, out)
+            .Answer<Marl::IVideoFrame>()
+            .Answer<Marl::IFrameIdentity>()
+            .Answer<Marl::IFrameData>()
+            .Answer<Marl::IFrameRows>()
+            .Result();
+    }
+    Guid GetHash() const override { return mHash; }
+    void SetHash(const Guid& hash) override { mHash = hash; }
+    Vellum::Rect GetBounds() const override { return {0, 0, mPicture->GetWidth(), mPicture->GetHeight()}; }
+    Vellum::Point GetOrigin() const override { return mOrigin; }
+    void SetOrigin(Vellum::Point origin) override { mOrigin = origin; }
+    Vellum::PixelFormat GetPixelFormat() const override { return mFormat; }
+    Vellum::PixelAspectRatio GetPixelAspectRatio() const override { return mAspect; }
+    void SetPixelAspectRatio(Vellum::PixelAspectRatio aspect) override { mAspect = aspect; }
+    std::uint32_t GetFieldType() const override { return Vellum::kFieldType_Progressive; }
+    void SetFieldType(std::uint32_t) override {}
+    std::uint32_t GetAlphaType() const override { return Vellum::kAlphaType_Straight; }
+    void SetAlphaType(std::uint32_t) override {}
+    std::uint64_t GetData() const override { return mPicture->GetData(); }
+    std::int32_t GetRowBytes() const override { return mPicture->GetRowBytes(); }
+
+private:
+    std::unique_ptr<DevicePicture> mPicture;
+    Vellum::PixelFormat mFormat;
+    Guid mHash;
+    Vellum::Point mOrigin;
+    Vellum::PixelAspectRatio mAspect;
+};
+
+}  // namespace
+
+VideoFrameRef MakePaddedFrame(const Kiln::DeviceRef& device, Vellum::PixelFormat format, const Picture& picture,
+                              int sparePixels) {
+    auto padded = std::make_unique<DevicePicture>(device, format, picture, sparePixels);
+    return VideoFrameRef(new PaddedFrame(std::move(padded), format));
+}
+
+EffectTest::EffectTest() {
+    Initialize(host.GetBasicSuite());
+    host.nodes[kMedia].kind = "Media";
+    host.nodes[kClip].kind = "Clip";
+    host.nodes[kClip].inputs = {{kMedia}};
+    host.nodes[kClip].operators = {kEffect};
+    host.nodes[kEffect].kind = "Effect";
+    host.sequences[kSequence].segments = {{0, Vellum::kTime_Max, 0, Guid(1, 0, 0, {}), kClip}};
+}
+
+EffectTest::~EffectTest() { Terminate(); }
+
+RenderNodeRef EffectTest::MakeEffect(const std::string& matchName, const Params& params) {
+    host.nodes[kEffect].properties["EffectNode::FilterMatchName"] = matchName;
+    host.nodes[kEffect].params = params;
+    const VideoSegmentsHandle handle(kSequence, SegmentsMode::kPlain, "");
+    const VideoNodeRef clip = AcquireRootNode(handle, 0);
+    RenderRequirements requirements;
+    requirements.frameRect = {0, 0, 64, 36};
+    requirements.device = GetDevice();
+    bool needsHost = false;
+    const Halden::WideString key = Halden::ToWide(matchName);
+    EXPECT_TRUE(isRegistered(key, GetDevice())) << matchName;
+    return createNode(key, GetDevice(), GetEffect(clip, 0), requirements, needsHost);
+}
+
+Status EffectTest::TryRenderOver(const RenderNodeRef& node, const VideoFrameRef& input, VideoFrameRef& output,
+                                 std::int64_t clipTime) {
+    node->SetInput(0, RenderNodeRef(new FrameSource(input)));
+    RenderParams params;
+    params.time = params.clipTime = clipTime;
+    params.outputRect = params.sequenceRect = input->GetBounds();
+    params.pixelAspectRatio = input->GetPixelAspectRatio();
+    params.quality = IsHalf() ? 1 : 3;
+    params.sequenceID = kSequence;
+    const auto results = boost::make_shared<RenderResults>();
+    const Status status = node->RenderFrame({}, params, results, output);
+    node->EndFrame({}, params, results, 0);
+    return status;
+}
+
+VideoFrameRef EffectTest::RenderOver(const RenderNodeRef& node, const VideoFrameRef& input, std::int64_t clipTime) {
+    VideoFrameRef output;
+    EXPECT_EQ(TryRenderOver(node, input, output, clipTime), Ostrand::kStatus_OK);
+    return output ? output : input;
+}
+
+Picture EffectTest::Apply(const std::string& matchName, const Params& params, const Picture& picture) {
+    const RenderNodeRef node = MakeEffect(matchName, params);
+    if (!node) return {};
+    constexpr int kSparePixels = 3;
+    return DownloadFrame(GetDevice(),
+                         RenderOver(node, MakePaddedFrame(GetDevice(), GetFormat(), picture, kSparePixels)));
+}
+
+}  // namespace Vantrel::Testing

@@ -1,0 +1,70 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <cstdint>
+#include <map>
+#include <string>
+#include <vector>
+
+#include "Src/Nodes/RenderNodeBase.h"
+#include "Tests/Support/DevicePictures.h"
+#include "Tests/Support/FakeHost.h"
+
+namespace Vantrel::Testing {
+
+/// A render tree's leaf that hands out one frame.
+class FrameSource final : public RenderNodeBase, public Ostrand::Allocated<FrameSource> {
+public:
+    explicit FrameSource(VideoFrameRef frame) : mFrame(std::move(frame)) {}
+    Status RenderFrame(const RenderToken&, const RenderParams&, const RenderResultsRef&,
+                       VideoFrameRef& frame) override {
+        frame = mFrame;
+        return Ostrand::kStatus_OK;
+    }
+
+protected:
+    std::atomic<std::int32_t>& GetRef() override { return mRefCount; }
+
+private:
+    VideoFrameRef mFrame;
+};
+
+/// A device frame whose rows are longer than the picture, by a pattern that nobody may touch.
+[[nodiscard]] VideoFrameRef MakePaddedFrame(const Kiln::DeviceRef& device, Vellum::PixelFormat format,
+                                            const Picture& picture, int sparePixels);
+
+/// Runs one effect as the engine does: made by its match name from the registry, over a frame, with the parameters of a
+/// scripted clip, on each device and in each pixel format.
+class EffectTest : public DeviceTest {
+protected:
+    EffectTest();
+    ~EffectTest() override;
+
+    using Params = std::map<std::int32_t, FakeParam>;
+
+    /// The node for an effect of the clip; empty, and the test fails, when there is none of its own.
+    [[nodiscard]] RenderNodeRef MakeEffect(const std::string& matchName, const Params& params);
+    /// Renders `node` over a frame at a clip time. Failures fail the test.
+    VideoFrameRef RenderOver(const RenderNodeRef& node, const VideoFrameRef& input, std::int64_t clipTime = 0);
+    Status TryRenderOver(const RenderNodeRef& node, const VideoFrameRef& input, VideoFrameRef& output,
+                         std::int64_t clipTime = 0);
+    /// The effect on a picture, as the device holds it.
+    [[nodiscard]] Picture Apply(const std::string& matchName, const Params& params, const Picture& picture);
+
+    /// What the plain solution reaches on every device, for values of about 1.
+    [[nodiscard]] Tolerance GetTolerance() const {
+        // 32 bits: some roundings of a short chain. 16 bits: half a step from rounding the result, one for a sum that
+        // the device rounded to the other side.
+        return IsHalf() ? Tolerance{1e-3, 1e-3} : Tolerance{2e-6, 1e-5};
+    }
+
+    static constexpr std::uint32_t kSequence = 1;
+    static constexpr std::uint32_t kClip = 1;
+    static constexpr std::uint32_t kMedia = 2;
+    static constexpr std::uint32_t kEffect = 3;
+
+    FakeHost host;
+};
+
+}  // namespace Vantrel::Testing
