@@ -126,7 +126,7 @@ CUresult cuEventRecord(CUevent event, CUstream handle) {
     const auto record = std::make_shared<CUevent_st::Record>();
     record->point.stream = stream->stream;
     record->point.ticket =
-        stream->stream->Submit([record] { record->time = CUevent_st::Clock::now(); }, GetDependencies(*stream));
+        stream->stream->Submit([time = record->time] { *time = CUevent_st::Clock::now(); }, GetDependencies(*stream));
     const std::lock_guard<std::mutex> lock(event->mutex);
     event->record = record;
     return CUDA_SUCCESS;
@@ -151,7 +151,7 @@ CUresult cuEventElapsedTime(float* milliseconds, CUevent start, CUevent end) {
     const auto last = end->Get();
     if (!first || !last) return CUDA_ERROR_INVALID_HANDLE;
     if (cuEventQuery(start) != CUDA_SUCCESS || cuEventQuery(end) != CUDA_SUCCESS) return CUDA_ERROR_NOT_READY;
-    *milliseconds = std::chrono::duration<float, std::milli>(last->time - first->time).count();
+    *milliseconds = std::chrono::duration<float, std::milli>(*last->time - *first->time).count();
     return CUDA_SUCCESS;
 }
 

@@ -28,10 +28,11 @@ struct CUstream_st {
 
 struct CUevent_st {
     using Clock = std::chrono::steady_clock;
-    /// One recording; the stream writes the time before it reaches the ticket.
+    /// One recording; the stream writes the time before it reaches the point. The time is held apart because queued work
+    /// must not hold on to its own stream.
     struct Record {
         SoftCuda::StreamPoint point;
-        Clock::time_point time;
+        std::shared_ptr<Clock::time_point> time = std::make_shared<Clock::time_point>();
     };
     CUcontext context = nullptr;
     std::mutex mutex;  ///< of the pointer

@@ -109,8 +109,10 @@ std::uint64_t Stream::RunItem(const Item& item) {
 void Stream::Work() {
     Item item;
     while (Pop(item)) {
-        Finish(RunItem(item));
+        const std::uint64_t count = RunItem(item);
+        // What the item holds goes before its waiters know: they may be about to destroy the stream.
         item = {};
+        Finish(count);
     }
 }
 
