@@ -34,11 +34,11 @@ Ostrand::Status FillWithTransparentBlack(const DeviceRef& device, DeviceBuffer b
                                          Vellum::PixelFormat format, std::int32_t left, std::int32_t top,
                                          std::int32_t width, std::int32_t height);
 Ostrand::Status FillWithOpaqueBlack(const DeviceRef& device, DeviceBuffer buffer, std::int32_t rowBytes,
-                                    Vellum::PixelFormat format, std::int32_t left, std::int32_t top,
-                                    std::int32_t width, std::int32_t height);
+                                    Vellum::PixelFormat format, std::int32_t left, std::int32_t top, std::int32_t width,
+                                    std::int32_t height);
 Ostrand::Status FillWithOpaqueWhite(const DeviceRef& device, DeviceBuffer buffer, std::int32_t rowBytes,
-                                    Vellum::PixelFormat format, std::int32_t left, std::int32_t top,
-                                    std::int32_t width, std::int32_t height);
+                                    Vellum::PixelFormat format, std::int32_t left, std::int32_t top, std::int32_t width,
+                                    std::int32_t height);
 
 /// Resamples all of the source onto all of the target. `scaleX` and `scaleY` are target size over source size; they may
 /// differ from the quotient of the whole sizes by the fraction that rounding to pixels took away.
@@ -50,9 +50,9 @@ Ostrand::Status Scale(const DeviceRef& device, DeviceBuffer source, std::int32_t
 /// Draws a layer: moves, scales and turns `source` into `target`.
 ///
 /// The layer's anchor (fractions of the source) comes to lie on the position (fractions of the target). Around it the
-/// layer is scaled (factors; the source's pixel aspect over the target's is applied besides) and then turned clockwise by
-/// `rotation` degrees in square-pixel space. Pixels outside the source are transparent; edges are exact to a fraction of a
-/// pixel by coverage; colour is weighed by alpha.
+/// layer is scaled (factors; the source's pixel aspect over the target's is applied besides) and then turned clockwise
+/// by `rotation` degrees in square-pixel space. Pixels outside the source are transparent; edges are exact to a
+/// fraction of a pixel by coverage; colour is weighed by alpha.
 /// @param opacity          0.0 to 1.0, multiplies the layer's alpha.
 /// @param blendMode        an IR_BlendMode; unknown numbers draw as kBlend_Normal.
 /// @param overDestination  false: the layer replaces the target where its box lies, and the rest of the target stays;
@@ -66,5 +66,20 @@ Ostrand::Status Motion(const DeviceRef& device, DeviceBuffer source, std::int32_
                        std::int32_t targetAspectDenominator, Vellum::PixelFormat format, float positionX,
                        float positionY, float anchorX, float anchorY, float scaleX, float scaleY, float rotation,
                        float opacity, std::int32_t blendMode, bool overDestination, Vellum::RenderQuality quality);
+
+/// Which lines of the target Accumulate fills; the others stay.
+enum AccumulateMode : std::int32_t { kAccumulate_Frame = 0, kAccumulate_UpperField = 1, kAccumulate_LowerField = 2 };
+
+/// Sums `count` pictures by weight into the target; colour is weighed by alpha. All of them have the target's size,
+/// format and row bytes. The weights are expected to sum to 1.
+/// @param mode an AccumulateMode; the upper field has the lines 0, 2, ...
+Ostrand::Status Accumulate(const DeviceRef& device, const DeviceBuffer* sources, const float* weights,
+                           std::int32_t count, DeviceBuffer target, std::int32_t rowBytes, std::int32_t width,
+                           Vellum::PixelFormat format, std::int32_t height, std::int32_t mode);
+
+/// Copies a picture with the lines of its two fields exchanged, pair by pair; an odd last line stays in its place.
+Ostrand::Status FieldReverse(const DeviceRef& device, DeviceBuffer source, std::int32_t sourceRowBytes,
+                             DeviceBuffer target, std::int32_t targetRowBytes, Vellum::PixelFormat format,
+                             std::int32_t width, std::int32_t height);
 
 }  // namespace Kiln
