@@ -5,9 +5,12 @@
 #include "Src/Filters/FieldTime.h"
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/Source/DeinterlaceSource.h"
+#include "Src/Filters/Source/FieldReverseSource.h"
 #include "Src/Filters/Source/InterlaceConsecutiveFramesSource.h"
+#include "Src/Filters/Source/InvertAlphaSource.h"
 #include "Src/Filters/Source/ReverseFieldDominanceSource.h"
 #include "Src/Filters/Source/ScaleSource.h"
+#include "Src/Filters/Source/TimeSampleSource.h"
 #include "Src/Filters/UploadNode.h"
 #include "Src/Nodes/FrameSizeLimit.h"
 #include "Src/Nodes/ProxyNode.h"
@@ -108,7 +111,7 @@ Status MediaNode::Configure(const VideoNodeRef& description, const RenderRequire
     if (ExceedsDeviceMemory(mStream.rect, *requirements.device)) return Ostrand::kStatus_Failure;
 
     const ChainPlan plan(*this, *mMedia, requirements);
-    mHasTimeSource = false;
+    mHasTimeSource = plan.timeSample;
     const Status status = BuildChain(plan, requirements, host);
     if (Ostrand::Failed(status)) return status;
     return FilterNode::Configure(description, requirements, host);
@@ -130,10 +133,13 @@ Status MediaNode::BuildChain(const ChainPlan& plan, const RenderRequirements& re
     const auto add = [&](bool wanted, auto adder) {
         if (wanted && !Ostrand::Failed(status)) status = (this->*adder)(requirements, host);
     };
+    add(plan.timeSample, &MediaNode::AddSource<TimeSampleSource>);
     add(true, &MediaNode::AddSource<ScaleSource>);
     add(plan.interlaceConsecutive, &MediaNode::AddSource<InterlaceConsecutiveFramesSource>);
     add(plan.deinterlace, &MediaNode::AddSource<DeinterlaceSource>);
     add(plan.reverseDominance, &MediaNode::AddSource<ReverseFieldDominanceSource>);
+    add(plan.fieldReverse, &MediaNode::AddSource<FieldReverseSource>);
+    add(plan.invertAlpha, &MediaNode::AddSource<InvertAlphaSource>);
     return status;
 }
 

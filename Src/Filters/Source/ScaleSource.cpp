@@ -11,21 +11,22 @@ namespace Vantrel {
 Status ScaleSource::Render(const RenderToken&, const RenderParams& params, const RenderResultsRef&) {
     if (!mFrameSlot || mFrameSlot->GetBounds() == params.outputRect) return Ostrand::kStatus_OK;
 
-    const VideoFrameRef input = mFrameSlot;
-    const FrameBuffer source = FrameBuffer::Demand(input);
-    if (Ostrand::Failed(Kiln::CreateGPUVideoFrame(mFrameSlot, mDevice, source.format, params.outputRect.Width(),
+    // The slot changes only when all has gone well: a second try starts from the input again.
+    const FrameBuffer source = FrameBuffer::Demand(mFrameSlot);
+    VideoFrameRef output;
+    if (Ostrand::Failed(Kiln::CreateGPUVideoFrame(output, mDevice, source.format, params.outputRect.Width(),
                                                   params.outputRect.Height(), params.pixelAspectRatio,
-                                                  Vellum::kFieldType_Progressive, input->GetOrigin()))) {
-        // The slot must hold the input again for a second try.
-        mFrameSlot = input;
+                                                  Vellum::kFieldType_Progressive, mFrameSlot->GetOrigin()))) {
         return Ostrand::kStatus_OutOfMemory;
     }
-    const FrameBuffer target = FrameBuffer::Demand(mFrameSlot);
+    const FrameBuffer target = FrameBuffer::Demand(output);
     const float factorX = static_cast<float>(target.Width()) / static_cast<float>(source.Width());
     const float factorY = static_cast<float>(target.Height()) / static_cast<float>(source.Height());
-    return Kiln::Scale(mDevice, source.data, source.rowBytes, source.Width(), source.Height(), target.data,
-                       target.rowBytes, target.Width(), target.Height(), source.format, factorX, factorY,
-                       Vellum::ToRenderQuality(params.quality));
+    const Status status = Kiln::Scale(mDevice, source.data, source.rowBytes, source.Width(), source.Height(),
+                                      target.data, target.rowBytes, target.Width(), target.Height(), source.format,
+                                      factorX, factorY, Vellum::ToRenderQuality(params.quality));
+    if (!Ostrand::Failed(status)) mFrameSlot = output;
+    return status;
 }
 
 }  // namespace Vantrel

@@ -1,0 +1,25 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include "Src/Filters/Source/InvertAlphaSource.h"
+
+#include "Src/Filters/Effects/OneKernelEffect.h"
+
+namespace Vantrel {
+namespace {
+
+EffectKernel gInvertAlpha{"..\\..\\Src\\Filters\\Source\\InvertAlphaSource", "InvertAlphaKernel", {}};
+
+void InvertAlphaKernel(DeviceValue /*frame*/, std::int32_t /*pitch*/, Vellum::PixelFormat /*format*/,
+                       std::int32_t /*width*/, std::int32_t /*height*/) {}
+
+}  // namespace
+
+Status InvertAlphaSource::Render(const RenderToken&, const RenderParams&, const RenderResultsRef&) {
+    const KernelFrame frame(mFrameSlot);
+    const std::uint64_t kernel = gInvertAlpha.Find(mDevice);
+    if (kernel == 0) return Ostrand::kStatus_Failure;
+    return Launch2D(mDevice, kernel, frame.Grid(), {}, InvertAlphaKernel, frame.Data(), frame.Pitch(), frame.Format(),
+                    frame.Width(), frame.Height());
+}
+
+}  // namespace Vantrel
