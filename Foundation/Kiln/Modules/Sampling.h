@@ -60,9 +60,10 @@ DEVICE_FUNCTION void SampleNearest(Lanes4* sum, AnyFrame in, int format, Region 
     FetchLanes(sum, in, format, index);
 }
 
-/// The filtered picture at LANES positions, tap by tap. `total` receives the weights' sum.
-DEVICE_FUNCTION void SampleTaps(Lanes4* sum, float* total, AnyFrame in, int format, Region region, int filter, Reach across,
-                                Reach down, const float* u, const float* v) {
+/// The filtered picture at LANES positions, tap by tap.
+DEVICE_FUNCTION void SampleTaps(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across, Reach down,
+                                const float* u, const float* v) {
+    float total[LANES];
     ClearLanes(sum);
     EACH_LANE(i) total[i] = 0.0f;
     for (int j = 0; j < down.taps; ++j) {
@@ -93,19 +94,27 @@ DEVICE_FUNCTION void SampleTaps(Lanes4* sum, float* total, AnyFrame in, int form
             }
         }
     }
+    // A stretched filter's weights add up to about its stretch; the others' to 1 but for rounding.
+    EACH_LANE(i) {
+        const float inverse = 1.0f / total[i];
+        sum->x[i] *= inverse;
+        sum->y[i] *= inverse;
+        sum->z[i] *= inverse;
+        sum->w[i] *= inverse;
+    }
 }
 
-/// Divides the colour of a sum by its alpha, and its alpha by the weights' total. An alpha that is 1 but for rounding becomes
-/// 1, one that the cubic's negative weights brought out of 0..1 comes back into it, and where no more than rounding is left
-/// the pixel is transparent black.
-DEVICE_FUNCTION void StraightenLanes(Lanes4* sum, const float* total) {
+/// Divides the colour of a sum by its alpha. An alpha that is 1 but for rounding becomes 1, one that the cubic's negative
+/// weights brought out of 0..1 comes back into it, and where no more than rounding is left the pixel is transparent black.
+DEVICE_FUNCTION void StraightenLanes(Lanes4* sum) {
     EACH_LANE(i) {
-        const float alpha = sum->w[i] / total[i];
+        const float alpha = sum->w[i];
         const int seen = alpha >= 1e-5f;
-        const float divisor = seen ? 1.0f / sum->w[i] : 0.0f;
-        sum->x[i] = seen ? sum->x[i] * divisor : 0.0f;
-        sum->y[i] = seen ? sum->y[i] * divisor : 0.0f;
-        sum->z[i] = seen ? sum->z[i] * divisor : 0.0f;
+        const float inverse = 1.0f / alpha;
+        const float x = sum->x[i] * inverse, y = sum->y[i] * inverse, z = sum->z[i] * inverse;
+        sum->x[i] = seen ? x : 0.0f;
+        sum->y[i] = seen ? y : 0.0f;
+        sum->z[i] = seen ? z : 0.0f;
         const float bounded = seen ? alpha : 0.0f;
         sum->w[i] = alpha > 0.999998f ? 1.0f : bounded;
     }
@@ -114,16 +123,16 @@ DEVICE_FUNCTION void StraightenLanes(Lanes4* sum, const float* total) {
 #if defined(DIALECT_LEVEL)
 #include "Kiln/Modules/SamplingCpu.h"
 #else
-DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, float* total, AnyFrame in, int format, Region region, int filter,
+DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter,
                                     Reach across, Reach down, const float* u, const float* v) {
-    SampleTaps(sum, total, in, format, region, filter, across, down, u, v);
+    SampleTaps(sum, in, format, region, filter, across, down, u, v);
 }
 
 /// As SampleFiltered for positions on one line, all at the same v, equally far apart.
-DEVICE_FUNCTION void SampleLine(Lanes4* sum, float* total, AnyFrame in, int format, Region region, int filter,
+DEVICE_FUNCTION void SampleLine(Lanes4* sum, AnyFrame in, int format, Region region, int filter,
                                 Reach across, Reach down, const float* u, float v) {
     float line[LANES];
     EACH_LANE(i) line[i] = v;
-    SampleTaps(sum, total, in, format, region, filter, across, down, u, line);
+    SampleTaps(sum, in, format, region, filter, across, down, u, line);
 }
 #endif
