@@ -5,6 +5,7 @@
 #include <algorithm>
 #include <cstring>
 #include <memory>
+#include <ostream>
 #include <utility>
 
 #include "Kiln/Backend.h"
@@ -84,6 +85,8 @@ std::string ToText(const DeviceCase& deviceCase) {
     return std::string(deviceCase.framework == Kiln::DeviceFramework::kCuda ? "Cuda" : "OpenCL") +
            (HasHalves(deviceCase.format) ? "16f" : "32f");
 }
+
+void PrintTo(const DeviceCase& deviceCase, std::ostream* stream) { *stream << ToText(deviceCase); }
 
 std::vector<DeviceCase> AllDeviceCases() {
     return {{Kiln::DeviceFramework::kCuda, Kiln::kPixelFormat_GPU_BGRA_4444_32f},

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <iosfwd>
 #include <string>
 #include <vector>
 
@@ -20,6 +21,7 @@ struct DeviceCase {
     Vellum::PixelFormat format;
 };
 [[nodiscard]] std::string ToText(const DeviceCase& deviceCase);
+void PrintTo(const DeviceCase& deviceCase, std::ostream* stream);
 /// Both frameworks in both pixel formats; the tests' names tell which.
 [[nodiscard]] std::vector<DeviceCase> AllDeviceCases();
 [[nodiscard]] std::string NameOfCase(const testing::TestParamInfo<DeviceCase>& info);
