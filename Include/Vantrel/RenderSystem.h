@@ -19,7 +19,8 @@ namespace Vantrel {
 /// Renders one sequence on one device. Held by shared pointer; all render systems must be gone before the last Terminate.
 ///
 /// Any thread may call the first five operations and PrepareRender. RenderFrames runs on the caller's thread, which holds
-/// the device (Kiln::Device::AcquireExclusiveAccess) across the call and keeps UpdateTimeline from running meanwhile.
+/// the device (Kiln::Device::AcquireExclusiveAccess) across the call and keeps UpdateTimeline from running meanwhile. One
+/// thread in the process is in RenderFrames at a time, whatever the device.
 class RenderSystem {
 public:
     virtual ~RenderSystem() = default;

@@ -19,14 +19,6 @@ constexpr Guid kHostRenderSubtreeID{0x54C17723, 0x704E, 0x4AFE, {0x84, 0x69, 0x1
 constexpr Guid kMulticamNodeID{0x0961DF84, 0x2605, 0x4B02, {0xB7, 0x05, 0x72, 0x04, 0x42, 0x5F, 0x35, 0xC2}};
 // clang-format on
 
-/// Writes a counted pointer as QueryInterface answers it. `object` must have the interface's own type.
-template <class Interface>
-Ostrand::Status AnswerInterface(Interface* object, void** out) {
-    object->AddRef();
-    *out = object;
-    return Ostrand::kStatus_OK;
-}
-
 /// Does an object have an interface, whose class need not be known? A null object has none.
 [[nodiscard]] inline bool HasInterface(Ostrand::OstrandUnknown* object, const Guid& iid) {
     void* answer = nullptr;

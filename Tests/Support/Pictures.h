@@ -43,6 +43,15 @@ private:
 /// The same with alpha 1.
 [[nodiscard]] Picture RandomOpaquePicture(Random& random, int width, int height);
 
+/// One colour.
+[[nodiscard]] inline Picture Plain(int width, int height, const Pixel& color) {
+    Picture picture(width, height);
+    for (int y = 0; y < height; ++y) {
+        for (int x = 0; x < width; ++x) picture.Set(x, y, color);
+    }
+    return picture;
+}
+
 /// What a device of that format holds of the picture: halves are rounded to nearest, ties to even.
 [[nodiscard]] Picture RoundTo(Picture picture, Vellum::PixelFormat format);
 
