@@ -32,8 +32,8 @@ private:
     Json MakeClip() {
         const double start = Chance(30) ? 86400 : 0;
         const double in = start + Pick(0, 60) + (Chance(10) ? 0.37 : 0);
-        Json clip = Clip("clip", Range(in, Pick(1, 14)), File("m" + std::to_string(Pick(0, 9)) + ".mov", start, 1000));
-        if (Chance(10)) clip["source_range"] = Range(in, Pick(1, 20), 30);
+        Json clip = Clip("clip", Range(in, Pick(1, 9)), File("m" + std::to_string(Pick(0, 9)) + ".mov", start, 1000));
+        if (Chance(10)) clip["source_range"] = Range(in, Pick(1, 12), 30);
         Dress(clip);
         return clip;
     }
@@ -47,24 +47,24 @@ private:
     }
 
     Json MakeItem(int depth) {
-        if (Chance(15)) return Gap(Pick(1, 8));
+        if (Chance(15)) return Gap(Pick(1, 5));
         if (depth >= 2 || Chance(65)) return MakeClip();
         Json nested =
             Chance(50) ? MakeTrack(depth + 1, false) : Stack({MakeTrack(depth + 1, true), MakeTrack(depth + 1, true)});
-        if (Chance(70)) nested["source_range"] = Range(Pick(0, 6), Pick(2, 20));
+        if (Chance(70)) nested["source_range"] = Range(Pick(0, 6), Pick(2, 10));
         Dress(nested);
         return nested;
     }
 
     Json MakeTrack(int depth, bool inStack) {
         std::vector<Json> children;
-        for (int i = Pick(1, 5); i > 0; --i) {
+        for (int i = Pick(1, 4); i > 0; --i) {
             if (Chance(20)) children.push_back(Dissolve(Pick(0, 4), Pick(0, 4)));
             children.push_back(MakeItem(depth));
         }
         if (Chance(10)) children.push_back(Dissolve(Pick(0, 3), Pick(0, 3)));
         Json track = Track(std::move(children));
-        if (inStack && Chance(20)) track["source_range"] = Range(Pick(-6, 6), Pick(4, 30));
+        if (inStack && Chance(20)) track["source_range"] = Range(Pick(-6, 6), Pick(4, 16));
         if (inStack && Chance(5)) track["effects"] = {Warp(1.5)};
         return track;
     }

@@ -1,0 +1,184 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include <gtest/gtest.h>
+
+#include "Tests/Host/EngineWalk.h"
+#include "Tests/Host/TimelineText.h"
+
+/// Timelines small enough to be worked out by hand. Times are in frames at 24 a second.
+namespace Vantrel::Host::Test {
+namespace {
+
+struct Expected {
+    std::int64_t start;
+    std::int64_t end;
+    std::int64_t offset;
+};
+
+void ExpectSegments(const Described& described, const std::vector<Expected>& expected) {
+    const std::vector<Segment>& segments = described.Segments();
+    ASSERT_EQ(segments.size(), expected.size());
+    for (std::size_t i = 0; i < expected.size(); ++i) {
+        EXPECT_EQ(segments[i].start, expected[i].start * kFrame) << "segment " << i;
+        EXPECT_EQ(segments[i].end, expected[i].end * kFrame) << "segment " << i;
+        EXPECT_EQ(segments[i].offset, expected[i].offset * kFrame) << "segment " << i;
+    }
+}
+
+/// The clip of a segment with a single layer.
+const Node& OnlyClip(const Segment& segment) {
+    EXPECT_EQ(segment.root->kind, NodeKind::kCompositor);
+    EXPECT_EQ(segment.root->inputs.size(), 1U);
+    return *segment.root->inputs.front().node;
+}
+
+std::int64_t OnlyFrameAt(std::int64_t frame) {
+    EngineWalk engine;
+    const std::vector<Shown> shown = engine.At(frame * kFrame);
+    return shown.size() == 1 ? shown.front().frame : -1;
+}
+
+std::string Property(const Node& node, const char* key) {
+    const std::string* value = node.FindProperty(key);
+    return value != nullptr ? *value : "(fails)";
+}
+
+Json TwoClipsAndAGap(double lead = 0) {
+    std::vector<Json> children{Clip("A", 10, 48), Gap(24), Clip("B", Range(86424, 72), File("B.mov", 86400, 1000))};
+    if (lead > 0) children.insert(children.begin(), Gap(lead));
+    return Timeline({Track(children)});
+}
+
+TEST(WorkedExamples, TwoClipsAndAGap) {
+    const Published described(TwoClipsAndAGap());
+    ExpectSegments(described, {{0, 48, 0}, {72, 144, 0}});
+    EXPECT_EQ(described.Segments()[1].start, 762048000000);
+    EXPECT_EQ(described.Segments()[1].end, 1524096000000);
+    const Node& a = OnlyClip(described.Segments()[0]);
+    const Node& b = OnlyClip(described.Segments()[1]);
+    EXPECT_EQ(a.inputs.front().offset, -10 * kFrame);
+    EXPECT_EQ(b.inputs.front().offset, -24 * kFrame);
+    EXPECT_EQ(a.TransformTime(30 * kFrame), 30 * kFrame);
+    EXPECT_EQ(Property(*b.inputs.front().node, "MediaNode::StartTimecodeOffset"), "914457600000000");
+    EXPECT_EQ(OnlyFrameAt(20), 30);
+    EXPECT_EQ(OnlyFrameAt(80), 32);
+    EngineWalk engine;
+    EXPECT_FALSE(engine.ClipTimeAt(60 * kFrame));
+    EXPECT_EQ(engine.ClipTimeAt(80 * kFrame), 8 * kFrame);
+}
+
+TEST(WorkedExamples, ContentThatMovesKeepsItsTrees) {
+    const Described before(TwoClipsAndAGap());
+    const Described after(TwoClipsAndAGap(24));
+    ExpectSegments(after, {{24, 72, 0}, {96, 168, 0}});
+    for (std::size_t i = 0; i < 2; ++i) EXPECT_EQ(before.Segments()[i].root->hash, after.Segments()[i].root->hash);
+    EXPECT_NE(before.snapshot->top->plain.hash, after.snapshot->top->plain.hash);
+}
+
+TEST(WorkedExamples, ATitleCutsAClipInThree) {
+    const Json title = GeneratorOf("title", {{"text", "hello"}});
+    const Described described(Timeline({Track({Clip("A", 10, 48)}), Track({Gap(12), Clip("T", Range(0, 12), title)})}));
+    ExpectSegments(described, {{0, 12, 0}, {12, 24, 0}, {24, 48, 24}});
+    EXPECT_EQ(described.Segments()[0].root->hash, described.Segments()[2].root->hash);
+    const Node& middle = *described.Segments()[1].root;
+    ASSERT_EQ(middle.inputs.size(), 2U);
+    EXPECT_EQ(middle.inputs[0].offset, -12 * kFrame);
+    EXPECT_EQ(middle.inputs[1].offset, 0);
+    EXPECT_EQ(middle.inputs[0].node.get(), &OnlyClip(described.Segments()[0]));
+}
+
+TEST(WorkedExamples, CrossDissolve) {
+    const Published described(Timeline({Track({Clip("A", Range(0, 96), File("A.mov", 0, 200)), Dissolve(12, 12),
+                                               Clip("B", Range(50, 96), File("B.mov", 0, 200))})}));
+    ExpectSegments(described, {{0, 84, 0}, {84, 108, -12}, {108, 192, 12}});
+    const NodeInput& transition = described.Segments()[1].root->inputs.front();
+    EXPECT_EQ(transition.offset, -12 * kFrame);
+    EXPECT_EQ(Property(*transition.node, "TransitionNode::TransitionMatchName"), "XQVE Cross Dissolve");
+    EXPECT_EQ(Property(*transition.node, "TransitionNode::TransitionDuration"), "254016000000");
+    ASSERT_EQ(transition.node->inputs.size(), 2U);
+    EXPECT_EQ(transition.node->inputs[0].offset, -84 * kFrame);
+    EXPECT_EQ(transition.node->inputs[1].offset, 12 * kFrame);
+    const Node& a = *transition.node->inputs[0].node;
+    const Node& b = *transition.node->inputs[1].node;
+    EXPECT_EQ(Property(a, "ClipNode::TrackItemEndAsTicks"), std::to_string(96 * kFrame));
+    EXPECT_EQ(Property(a, "ClipNode::EffectiveTrackItemEndAsTicks"), std::to_string(108 * kFrame));
+    EXPECT_EQ(Property(b, "ClipNode::TrackItemStartAsTicks"), std::to_string(96 * kFrame));
+    EXPECT_EQ(Property(b, "ClipNode::EffectiveTrackItemStartAsTicks"), std::to_string(84 * kFrame));
+
+    EngineWalk engine;
+    struct Case {
+        std::int64_t time, clipTime, a, b;
+    };
+    for (const Case& c : {Case{84, -12, 84, 38}, Case{96, 0, 96, 50}, Case{107, 11, 107, 61}}) {
+        EXPECT_EQ(engine.ClipTimeAt(c.time * kFrame), c.clipTime * kFrame);
+        const std::vector<Shown> shown = engine.At(c.time * kFrame);
+        ASSERT_EQ(shown.size(), 2U);
+        EXPECT_EQ(shown[0].frame, c.a);
+        EXPECT_EQ(shown[1].frame, c.b);
+    }
+}
+
+TEST(WorkedExamples, NestedSequenceAtTwiceTheSpeed) {
+    Json more = Effects({Warp(2.0)});
+    more["source_range"] = Range(40, 60);
+    const Json nested = Stack({Track({Clip("P", 0, 120), Clip("Q", 0, 120)})}, more);
+    const Published described(Timeline({Track({Gap(24), nested})}));
+    ExpectSegments(described, {{24, 84, 0}});
+    const Node& clip = OnlyClip(described.Segments()[0]);
+    EXPECT_EQ(clip.inputs.front().offset, -20 * kFrame);
+    const Node& media = *clip.inputs.front().node;
+    EXPECT_EQ(Property(media, "MediaNode::ClipID"), "(fails)");
+    EXPECT_NE(Property(media, "MediaNode::NestedSequenceTimelineID"), "(fails)");
+    EXPECT_EQ(clip.TransformTime(50 * kFrame), 100 * kFrame);
+    EngineWalk engine;
+    struct Case {
+        std::int64_t time;
+        const char* media;
+        std::int64_t frame;
+    };
+    for (const Case& c : {Case{54, "/media/P.mov", 100}, Case{64, "/media/Q.mov", 0}, Case{83, "/media/Q.mov", 38}}) {
+        const std::vector<Shown> shown = engine.At(c.time * kFrame);
+        ASSERT_EQ(shown.size(), 1U) << c.time;
+        EXPECT_EQ(shown[0].media, c.media);
+        EXPECT_EQ(shown[0].frame, c.frame);
+    }
+}
+
+Json BlurKeys() {
+    return {{"blurriness",
+             {{"keyframes",
+               {{{"t", Time(30)}, {"value", 0.0}, {"interp", "linear"}}, {{"t", Time(78)}, {"value", 48.0}}}}}}};
+}
+
+TEST(WorkedExamples, FreezeFrameAndAnEffect) {
+    for (const bool hold : {true, false}) {
+        Json more = Effects({Effect("TQ.XQVE Gaussian Blur 2", BlurKeys())});
+        if (hold) more["effects"].push_back(Freeze());
+        const Published described(Timeline({Track({Clip("C", 30, 48, more)})}));
+        const Node& clip = OnlyClip(described.Segments()[0]);
+        EXPECT_EQ(Property(clip, "ClipNode::FrameHoldAtTime"), hold ? "317520000000" : "(fails)");
+        EXPECT_EQ(Property(clip, "ClipNode::ClipSpeed"), "1");
+        EXPECT_EQ(clip.inputs.front().offset, hold ? 0 : -30 * kFrame);
+        EXPECT_EQ(OnlyFrameAt(24), hold ? 30 : 54);
+        // Keyframes mean the same with and without the hold.
+        const std::int64_t parameterTime = clip.TransformTime(24 * kFrame - clip.inputs.front().offset);
+        EXPECT_EQ(parameterTime, 54 * kFrame);
+        const Parameter& blurriness = *clip.operators.at(0)->FindParameter(0);
+        EXPECT_DOUBLE_EQ(blurriness.At(parameterTime)[0], 24.0);
+        EXPECT_EQ(blurriness.KeyAfter(0), 0);
+        EXPECT_EQ(blurriness.KeyAfter(30 * kFrame), 1);
+        EXPECT_EQ(blurriness.KeyAfter(78 * kFrame), std::nullopt);
+    }
+}
+
+TEST(WorkedExamples, FiltersOfAHeldClipMayStandStillToo) {
+    Json more = Effects({Effect("TQ.XQVE Gaussian Blur 2", BlurKeys()), Freeze()});
+    more.update(Own({{"hold_filters", true}}));
+    const Described described(Timeline({Track({Clip("C", 30, 48, more)})}));
+    const ItemDetail& item = *OnlyClip(described.Segments()[0]).AsItem();
+    EXPECT_EQ(item.time.AtItemTime(24 * kFrame).parameters, 30 * kFrame);
+    EXPECT_EQ(item.time.AtItemTime(24 * kFrame).media, 30 * kFrame);
+}
+
+}  // namespace
+}  // namespace Vantrel::Host::Test
