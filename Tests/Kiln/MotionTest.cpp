@@ -98,7 +98,7 @@ TEST_P(MotionOnEachDevice, MatchesTheReference) {
         // Where a place between pixels is in doubt by its last digits: a cubic's slope over noise makes 1e-4 of 1e-5,
         // and the nearest pixel can be another one.
         Tolerance tolerance{IsHalf() ? 3e-3 : 3e-4, 0.0, true};
-        if (drawing.quality < RenderQuality::kMedium) tolerance.exceptionShare = 0.005;
+        tolerance.exceptionShare = drawing.quality < RenderQuality::kMedium ? 0.005 : 0.0005;
         EXPECT_TRUE(PicturesAgree(Draw(layer, layerRect, target, targetRect, drawing),
                                   Reference(layer, layerRect, target, targetRect, drawing), tolerance));
     }

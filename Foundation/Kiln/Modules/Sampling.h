@@ -120,19 +120,77 @@ DEVICE_FUNCTION void StraightenLanes(Lanes4* sum) {
     }
 }
 
+/// A cubic's negative weights can cancel nearly all of an alpha and leave colour over, which the division then blows up.
+/// Where less than a quarter of alpha carries a colour beyond -2..2, the colour is brought back between those of the taps
+/// that are seen. That is rare: all others pay for the question alone.
+DEVICE_FUNCTION void RestrainLanes(Lanes4* pixels, AnyFrame in, int format, Region region, Reach across, Reach down,
+                                   const float* u, const float* v) {
+    int wild[LANES];
+    int any = 0;
+    EACH_LANE(i) {
+        const float largest = Max(Max(Abs(pixels->x[i]), Abs(pixels->y[i])), Abs(pixels->z[i]));
+        wild[i] = largest > 2.0f && pixels->w[i] < 0.25f;
+        any |= wild[i];
+    }
+    if (any == 0) return;
+    Lanes4 least, most;
+    EACH_LANE(i) {
+        SetLane(&least, i, Splat4(3e38f));
+        SetLane(&most, i, Splat4(-3e38f));
+    }
+    for (int tap = 0; tap < across.taps * down.taps; ++tap) {
+        int index[LANES], counts[LANES];
+        EACH_LANE(i) {
+            const int column = FirstTap(across, u[i]) + tap % across.taps, row = FirstTap(down, v[i]) + tap / across.taps;
+            const float weight = FilterWeight(FILTER_BICUBIC, ((float)column + 0.5f - u[i]) * across.inverse) *
+                                 FilterWeight(FILTER_BICUBIC, ((float)row + 0.5f - v[i]) * down.inverse);
+            index[i] = (region.top + ClampInt(row, 0, region.height - 1)) * region.pitch + region.left +
+                       ClampInt(column, 0, region.width - 1);
+            counts[i] = weight != 0.0f;
+        }
+        Lanes4 taps;
+        FetchLanes(&taps, in, format, index);
+        EACH_LANE(i) {
+            const Float4 color = GetLane(&taps, i);
+            const int seen = counts[i] && color.w > 0.0f;
+            SetLane(&least, i, Select4(seen, Min4(color, GetLane(&least, i)), GetLane(&least, i)));
+            SetLane(&most, i, Select4(seen, Max4(color, GetLane(&most, i)), GetLane(&most, i)));
+        }
+    }
+    EACH_LANE(i) {
+        pixels->x[i] = wild[i] ? Clamp(pixels->x[i], least.x[i], most.x[i]) : pixels->x[i];
+        pixels->y[i] = wild[i] ? Clamp(pixels->y[i], least.y[i], most.y[i]) : pixels->y[i];
+        pixels->z[i] = wild[i] ? Clamp(pixels->z[i], least.z[i], most.z[i]) : pixels->z[i];
+    }
+}
+
 #if defined(DIALECT_LEVEL)
 #include "Kiln/Modules/SamplingCpu.h"
 #else
-DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter,
-                                    Reach across, Reach down, const float* u, const float* v) {
+DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across,
+                                    Reach down, const float* u, const float* v) {
     SampleTaps(sum, in, format, region, filter, across, down, u, v);
 }
 
-/// As SampleFiltered for positions on one line, all at the same v, equally far apart.
-DEVICE_FUNCTION void SampleLine(Lanes4* sum, AnyFrame in, int format, Region region, int filter,
-                                Reach across, Reach down, const float* u, float v) {
-    float line[LANES];
-    EACH_LANE(i) line[i] = v;
-    SampleTaps(sum, in, format, region, filter, across, down, u, line);
+/// As SampleFiltered for positions along a line: all at the same v, equally far apart.
+DEVICE_FUNCTION void SampleLine(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across, Reach down,
+                                const float* u, const float* v) {
+    SampleTaps(sum, in, format, region, filter, across, down, u, v);
 }
 #endif
+
+/// The picture at LANES positions, straight.
+/// @param inLine the positions lie along a line
+DEVICE_FUNCTION void SampleLanes(Lanes4* pixels, AnyFrame in, int format, Region region, int filter, Reach across,
+                                 Reach down, const float* u, const float* v, int inLine) {
+    if (filter == FILTER_NEAREST) {
+        SampleNearest(pixels, in, format, region, u, v);
+        return;
+    }
+    if (inLine != 0)
+        SampleLine(pixels, in, format, region, filter, across, down, u, v);
+    else
+        SampleFiltered(pixels, in, format, region, filter, across, down, u, v);
+    StraightenLanes(pixels);
+    if (filter == FILTER_BICUBIC) RestrainLanes(pixels, in, format, region, across, down, u, v);
+}

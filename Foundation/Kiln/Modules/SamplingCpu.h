@@ -160,20 +160,18 @@ DEVICE_FUNCTION void SumColumns(Vector4* columns, AnyFrame in, int format, Regio
 }
 
 DEVICE_FUNCTION void SampleLine(Lanes4* sum, AnyFrame in, int format, Region region, int filter,
-                                Reach across, Reach down, const float* u, float v) {
+                                Reach across, Reach down, const float* u, const float* v) {
     const int taps = (across.taps + 1) & ~1;
     const int low = FirstTap(across, Min(u[0], u[LANES - 1])), high = FirstTap(across, Max(u[0], u[LANES - 1])) + taps;
     if (taps > MOST_TAPS || down.taps > MOST_TAPS || high - low > MOST_COLUMNS || low >= region.width || high <= 0) {
-        float line[LANES];
-        EACH_LANE(i) line[i] = v;
-        SampleTaps(sum, in, format, region, filter, across, down, u, line);
+        SampleTaps(sum, in, format, region, filter, across, down, u, v);
         return;
     }
     LaneTaps tapsAcross;
     RowTaps rows;
     Vector4 columns[MOST_COLUMNS], pixels[LANES];
     WeighTaps(&tapsAcross, filter, across, taps, u);
-    WeighRows(&rows, filter, down, region, v);
+    WeighRows(&rows, filter, down, region, v[0]);
     if (down.taps == 4)
         SumColumns(columns, in, format, region, &rows, 4, low, high);
     else if (down.taps == 2)

@@ -36,7 +36,8 @@ struct LayerDrawing {
 ///
 /// Coverage is the share of a pixel's width across the layer's border that lies inside, for both directions multiplied;
 /// for a layer that isn't turned that is the exact share of the pixel. A layer whose pixels fall onto the target's is
-/// copied without a filter; see Sample for the others. A layer that replaces is mixed by coverage with what it replaces.
+/// copied without a filter; see Sample for the others. A layer that replaces is mixed by coverage with what it
+/// replaces.
 void DrawLayer(const Picture& layer, const LayerDrawing& drawing, Picture& target);
 
 }  // namespace Vantrel::Host::Software

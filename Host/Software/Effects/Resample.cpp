@@ -54,18 +54,30 @@ Pixel Sample(const Picture& picture, double u, double v, double footprintU, doub
     const Taps across = MakeTaps(u, footprintU, cubic);
     const Taps down = MakeTaps(v, footprintV, cubic);
     Pixel sum{};
+    Pixel least{HUGE_VAL, HUGE_VAL, HUGE_VAL, 0.0};
+    Pixel most{-HUGE_VAL, -HUGE_VAL, -HUGE_VAL, 0.0};
     for (std::size_t j = 0; j < down.weights.size(); ++j) {
         const int y = std::clamp(down.first + static_cast<int>(j), 0, picture.height - 1);
         for (std::size_t i = 0; i < across.weights.size(); ++i) {
             const int x = std::clamp(across.first + static_cast<int>(i), 0, picture.width - 1);
             const Pixel pixel = picture.Get(x, y);
             const double weight = across.weights[i] * down.weights[j] * pixel[3];
-            for (std::size_t c = 0; c < 3; ++c) sum[c] += weight * pixel[c];
+            for (std::size_t c = 0; c < 3; ++c) {
+                sum[c] += weight * pixel[c];
+                if (weight == 0.0) continue;
+                least[c] = std::min(least[c], pixel[c]);
+                most[c] = std::max(most[c], pixel[c]);
+            }
             sum[3] += weight;
         }
     }
     if (sum[3] < kLeastAlpha) return Pixel{};
-    return {sum[0] / sum[3], sum[1] / sum[3], sum[2] / sum[3], std::min(sum[3], 1.0)};
+    Pixel out{sum[0] / sum[3], sum[1] / sum[3], sum[2] / sum[3], std::min(sum[3], 1.0)};
+    const double largest = std::max({std::abs(out[0]), std::abs(out[1]), std::abs(out[2])});
+    if (cubic && largest > 2.0 && out[3] < 0.25) {
+        for (std::size_t c = 0; c < 3; ++c) out[c] = std::clamp(out[c], least[c], most[c]);
+    }
+    return out;
 }
 
 void Resample(const Picture& source, Picture& target, double scaleX, double scaleY, Vellum::RenderQuality quality) {
