@@ -2,6 +2,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <gmock/gmock.h>
 
+#include <atomic>
+#include <thread>
+
 #include "Halden/Trace.h"
 #include "Tests/Timeline/TimelineTester.h"
 
@@ -189,6 +192,37 @@ TEST_F(TimelineUpdate, WithoutASequenceThereIsNothing) {
     EXPECT_EQ(timeline->GetSequenceFormat(rect, aspect, rate, field), 0);
     EXPECT_EQ(rect, (Vellum::Rect{0, 0, 64, 36}));
     EXPECT_EQ(rate.GetTicksPerFrame(), 10160640000);
+}
+
+TEST_F(TimelineUpdate, ReadersSeeOneUpdateOrTheNext) {
+    AddPlainClip(10);
+    AddPlainClip(11);
+    AddSegment(kTop, 0, 100, 10);
+    AddSegment(kTop, 100, 200, 11);
+    Timeline& read = Read();
+    std::atomic<bool> done{false};
+    std::thread reader([&] {
+        while (!done) {
+            SegmentInfo first, second;
+            Vellum::Rect rect;
+            Vellum::PixelAspectRatio aspect;
+            Vellum::FrameRate rate;
+            std::uint32_t field = 0;
+            EXPECT_EQ(read.GetSequenceFormat(rect, aspect, rate, field), 0);
+            ASSERT_EQ(read.GetSegmentInfo(50, first, false), Ostrand::kStatus_OK);
+            EXPECT_TRUE(first.tree);
+            EXPECT_EQ(read.GetSegmentInfo(50, second, true), Ostrand::kStatus_OK);
+        }
+    });
+    for (int round = 0; round < 50; ++round) {
+        auto& segments = host.sequences[kTop].segments;
+        std::swap(segments[0].hash, segments[1].hash);
+        std::swap(segments[0].node, segments[1].node);
+        Change();
+        EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    }
+    done = true;
+    reader.join();
 }
 
 TEST_F(TimelineUpdate, PreviewListsAreReadByTheirOwnEntries) {
