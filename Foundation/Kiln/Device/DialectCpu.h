@@ -61,13 +61,25 @@ typedef unsigned long ulong;
     (void)(argument);                             \
     const Type* const pointer = (const Type*)&name
 
-#define POSITION(x, y) [[maybe_unused]] const int x = cell_.x + cell_.lane, y = cell_.y
-#define SOURCE_PIXEL(p) const Float4 p = LoadStrip(cell_.source, cell_.lane)
-#define SECOND_PIXEL(p) const Float4 p = LoadStrip(cell_.second, cell_.lane)
-#define THIRD_PIXEL(p) const Float4 p = LoadStrip(cell_.third, cell_.lane)
-#define WORK_PIXEL(p) const Float4 p = LoadStrip(cell_.work, cell_.lane)
-#define STORE(value) StoreStrip(cell_.target, cell_.lane, value)
-#define STORE_WORK(value) StoreStrip(cell_.target, cell_.lane, value)
+// The arguments' fixed names are spoken although only GPU code needs them, so that a wrong one fails here as well.
+#define DIALECT_FRAME_NAMES(frame, pitch) (void)(frame), (void)(pitch), (void)(format)
+#define POSITION(x, y)             \
+    (void)(width), (void)(height); \
+    [[maybe_unused]] const int x = cell_.x + cell_.lane, y = cell_.y
+#define SOURCE_PIXEL(p)               \
+    DIALECT_FRAME_NAMES(in, inPitch); \
+    const Float4 p = LoadStrip(cell_.source, cell_.lane)
+#define SECOND_PIXEL(p)                 \
+    DIALECT_FRAME_NAMES(in2, in2Pitch); \
+    const Float4 p = LoadStrip(cell_.second, cell_.lane)
+#define THIRD_PIXEL(p)                  \
+    DIALECT_FRAME_NAMES(in3, in3Pitch); \
+    const Float4 p = LoadStrip(cell_.third, cell_.lane)
+#define WORK_PIXEL(p)                  \
+    DIALECT_FRAME_NAMES(frame, pitch); \
+    const Float4 p = LoadStrip(cell_.work, cell_.lane)
+#define STORE(value) (DIALECT_FRAME_NAMES(out, outPitch), StoreStrip(cell_.target, cell_.lane, value))
+#define STORE_WORK(value) (DIALECT_FRAME_NAMES(frame, pitch), StoreStrip(cell_.target, cell_.lane, value))
 
 #define LANE_POSITION_IN(x, y, lanes, itemsX, itemsY) \
     const int x = cell_.x, y = cell_.y;               \
