@@ -70,14 +70,26 @@ std::vector<unsigned char> DownloadRows(const Kiln::DeviceRef& device, std::uint
     return bytes;
 }
 
-/// Holds Kiln up until the process ends: tests come and go too fast to find the devices anew each time.
-void InitializeOnce() {
-    static const bool done = [] {
-        Kiln::Initialize(true);
-        return true;
-    }();
-    static_cast<void>(done);
-}
+/// Holds Kiln up until the last test has run: tests come and go too fast to find the devices anew each time. After that
+/// it goes while the CPU driver's own statics are still there.
+class KilnForAllTests final : public ::testing::Environment {
+public:
+    void InitializeOnce() {
+        if (!mIsUp) Kiln::Initialize(true);
+        mIsUp = true;
+    }
+    void TearDown() override {
+        if (mIsUp) Kiln::Terminate();
+        mIsUp = false;
+    }
+
+private:
+    bool mIsUp = false;
+};
+
+// Owned by the test framework from here on.
+auto* const gKiln = new KilnForAllTests;
+const ::testing::Environment* const kRegistered = ::testing::AddGlobalTestEnvironment(gKiln);
 
 }  // namespace
 
@@ -97,7 +109,7 @@ std::vector<DeviceCase> AllDeviceCases() {
 
 std::string NameOfCase(const testing::TestParamInfo<DeviceCase>& info) { return ToText(info.param); }
 
-DeviceTest::DeviceTest() { InitializeOnce(); }
+DeviceTest::DeviceTest() { gKiln->InitializeOnce(); }
 
 DeviceTest::~DeviceTest() {
     if (mDevice) mDevice->ReleaseExclusiveAccess();
