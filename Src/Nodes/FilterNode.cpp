@@ -36,7 +36,7 @@ RenderNodeRef FilterNode::WrapInput(const RenderNodeRef& node) {
         FindEffectNode(filter, u"MulticamRenderNode")) {
         return node;
     }
-    const RenderNodeRef wrapper = MakeIntrinsicNode();
+    RenderNodeRef wrapper = MakeIntrinsicNode();
     wrapper->SetInput(0, node);
     bool host = false;
     wrapper->Configure(filter->GetDescription(), GetRequirements(), host);
@@ -65,7 +65,7 @@ bool FilterNode::IsStill() const {
 
 VideoFrameRef FilterNode::FindCachedFrame(const Guid& hash, const RenderResultsRef& results) const {
     if (hash.IsNil()) return {};
-    if (const VideoFrameRef stored = results->FindFrame(hash)) {
+    if (VideoFrameRef stored = results->FindFrame(hash)) {
         // A frame that was rendered further in place carries another fingerprint by now.
         if (Ostrand::Demand<Marl::IFrameIdentity>(stored)->GetHash() == hash) return stored;
     }

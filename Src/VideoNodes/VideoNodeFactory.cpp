@@ -118,7 +118,7 @@ VideoNodeRef AcquireOperator(std::uint32_t timelineID, std::uint32_t nodeID, std
 
 VideoMediaNodeRef GetClipMedia(const VideoNodeRef& clip) {
     if (!clip) return {};
-    const VideoMediaNodeRef media = boost::dynamic_pointer_cast<VideoMediaNode>(
+    VideoMediaNodeRef media = boost::dynamic_pointer_cast<VideoMediaNode>(
         AcquireInput(clip->GetTimelineID(), clip->GetNodeID(), 0, clip->GetTimeOffset()));
     if (media) media->SetParent(clip);
     return media;
@@ -126,7 +126,7 @@ VideoMediaNodeRef GetClipMedia(const VideoNodeRef& clip) {
 
 VideoEffectNodeRef GetEffect(const VideoNodeRef& clip, std::int32_t index) {
     if (!clip) return {};
-    const VideoEffectNodeRef effect = boost::dynamic_pointer_cast<VideoEffectNode>(
+    VideoEffectNodeRef effect = boost::dynamic_pointer_cast<VideoEffectNode>(
         AcquireOperator(clip->GetTimelineID(), clip->GetNodeID(), index, clip->GetTimeOffset()));
     if (effect) {
         effect->SetOperatorIndex(index);
