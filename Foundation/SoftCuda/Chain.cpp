@@ -30,24 +30,23 @@ bool Contains(const std::vector<FrameUse>& frames, const FrameUse& frame) {
 }
 
 /// Does the launch read any of the bytes through a plain pointer? How far it reads is anyone's guess: all of the block.
-bool ReadsThroughPointer(const Launch& launch, const std::uint8_t* begin, const std::uint8_t* end) {
+bool ReadsThroughPointer(const Launch& launch, const AddressRange& range) {
     for (std::size_t i = 0; i < launch.kernel->argumentCount; ++i) {
         const ArgumentRecord& argument = launch.kernel->arguments[i];
         if (argument.role != Role::kConstantPointer && argument.role != Role::kPointer) continue;
         std::uintptr_t address;
         std::memcpy(&address, launch.parameters.data() + argument.offset, sizeof address);
         const std::optional<Block> block = GetMemory().Find(address);
-        if (block && block->base < reinterpret_cast<std::uintptr_t>(end) &&
-            reinterpret_cast<std::uintptr_t>(begin) < block->base + block->bytes)
-            return true;
+        if (block && range.Overlaps({block->base, block->base + block->bytes})) return true;
     }
     return false;
 }
 
 }  // namespace
 
-Chain::Extent Chain::GetExtent(const Launch& launch, const FrameUse& frame) const {
-    return {frame.base, frame.base + launch.GetFrameBytes(frame)};
+AddressRange Chain::GetExtent(const Launch& launch, const FrameUse& frame) {
+    const auto base = reinterpret_cast<std::uintptr_t>(frame.base);
+    return {base, base + launch.GetFrameBytes(frame)};
 }
 
 bool Chain::Fits(const Launch& launch) const {
@@ -59,18 +58,24 @@ bool Chain::Fits(const Launch& launch) const {
     for (const FrameUse& frame : launch.frames) {
         if (frame.base == nullptr || Contains(mFrames, frame)) continue;
         ++added;
-        const Extent mine = GetExtent(launch, frame);
-        for (const FrameUse& other : mFrames) {
-            const Extent theirs = GetExtent(launch, other);
-            if (mine.begin < theirs.end && theirs.begin < mine.end) return false;
-        }
+        for (const FrameUse& other : mFrames)
+            if (GetExtent(launch, frame).Overlaps(GetExtent(launch, other))) return false;
     }
     if (mFrames.size() + added > kMaxFrames) return false;
-    const Extent written = GetExtent(launch, GetWritten(launch));
+    const AddressRange written = GetExtent(launch, GetWritten(launch));
     return std::none_of(mLaunches.begin(), mLaunches.end(), [&](const Launch& earlier) {
-        const Extent theirs = GetExtent(earlier, GetWritten(earlier));
-        return ReadsThroughPointer(earlier, written.begin, written.end) ||
-               ReadsThroughPointer(launch, theirs.begin, theirs.end);
+        return ReadsThroughPointer(earlier, written) ||
+               ReadsThroughPointer(launch, GetExtent(earlier, GetWritten(earlier)));
+    });
+}
+
+bool Chain::IsApart(const AddressRange& target, const AddressRange& source) const {
+    return std::none_of(mLaunches.begin(), mLaunches.end(), [&](const Launch& launch) {
+        const auto touches = [&](const FrameUse& frame) {
+            return frame.base != nullptr && target.Overlaps(GetExtent(launch, frame));
+        };
+        return source.Overlaps(GetExtent(launch, GetWritten(launch))) || target.Overlaps(launch.module) ||
+               std::any_of(launch.frames.begin(), launch.frames.end(), touches) || ReadsThroughPointer(launch, target);
     });
 }
 

@@ -19,6 +19,8 @@ class Chain {
 public:
     /// Adds a launch if it fits those that are there; an empty chain takes any pointwise launch.
     bool TryAdd(const Launch& launch);
+    /// May a copy from `source` to `target` run before the launches as well as after them?
+    [[nodiscard]] bool IsApart(const AddressRange& target, const AddressRange& source) const;
     [[nodiscard]] bool IsEmpty() const { return mLaunches.empty(); }
     [[nodiscard]] std::size_t GetLength() const { return mLaunches.size(); }
 
@@ -39,16 +41,12 @@ private:
         FrameUse frame;
         bool used = false;
     };
-    struct Extent {
-        const std::uint8_t* begin;
-        const std::uint8_t* end;
-    };
 
     static constexpr std::size_t kMaxLaunches = 32;
     static constexpr std::size_t kMaxFrames = 6;
     static constexpr int kSlots = static_cast<int>(kMaxFrames) + 2;
 
-    [[nodiscard]] Extent GetExtent(const Launch& launch, const FrameUse& frame) const;
+    [[nodiscard]] static AddressRange GetExtent(const Launch& launch, const FrameUse& frame);
     [[nodiscard]] bool Fits(const Launch& launch) const;
     [[nodiscard]] bool ReadsLater(std::size_t launch, const FrameUse& frame) const;
     [[nodiscard]] bool WritesLater(std::size_t launch, const FrameUse& frame) const;

@@ -46,8 +46,29 @@ bool IsDevice(CUdeviceptr address, std::size_t bytes) {
 /// Memory that the driver can't hold on to after the call returns: the API copies from and to it before that.
 bool IsPageable(const void* host) { return !GetMemory().Find(reinterpret_cast<std::uintptr_t>(host)); }
 
+CUresult CopySmall(void* target, const void* source, std::size_t bytes, CUstream handle, bool wait,
+                   std::shared_ptr<void> holder) {
+    CUstream_st* stream = nullptr;
+    if (const CUresult result = FindStream(handle, stream); result != CUDA_SUCCESS) return result;
+    const auto number = [](const void* address) { return reinterpret_cast<std::uintptr_t>(address); };
+    const std::uint64_t ticket =
+        stream->stream->Submit({number(target), number(source), bytes, std::move(holder)}, GetDependencies(*stream));
+    if (wait) stream->stream->Wait(ticket);
+    return CUDA_SUCCESS;
+}
+
 CUresult Copy(void* target, const void* source, std::size_t bytes, CUstream stream, bool wait) {
+    if (bytes <= Stream::kSmallBytes) return CopySmall(target, source, bytes, stream, wait, nullptr);
     return Enqueue(stream, wait, [=] { CopyBytes(target, source, bytes); });
+}
+
+/// From host memory; what is pageable is taken before the call returns.
+CUresult CopyFromHost(void* target, const void* source, std::size_t bytes, CUstream stream) {
+    if (!IsPageable(source)) return Copy(target, source, bytes, stream, false);
+    if (bytes > Stream::kSmallBytes) return Copy(target, source, bytes, stream, true);
+    const auto taken = std::make_shared<std::vector<std::uint8_t>>(bytes);
+    if (bytes != 0) std::memcpy(taken->data(), source, bytes);
+    return CopySmall(target, taken->data(), bytes, stream, false, taken);
 }
 
 void* Address(CUdeviceptr address) { return reinterpret_cast<void*>(address); }
@@ -214,7 +235,7 @@ CUresult cuMemHostGetFlags(unsigned* flags, void* host) {
 
 CUresult cuMemcpyHtoDAsync(CUdeviceptr target, const void* source, size_t bytes, CUstream stream) {
     if (bytes != 0 && (source == nullptr || !IsDevice(target, bytes))) return CUDA_ERROR_INVALID_VALUE;
-    return Copy(Address(target), source, bytes, stream, IsPageable(source));
+    return CopyFromHost(Address(target), source, bytes, stream);
 }
 SOFTCUDA_V2(cuMemcpyHtoDAsync);
 

@@ -5,6 +5,7 @@
 
 #include <dlfcn.h>
 #include <elf.h>
+#include <link.h>
 #include <sys/mman.h>
 #include <unistd.h>
 
@@ -62,6 +63,21 @@ std::string GetSymbol(const char* kind, int level, const char* name) {
     return std::string("softcuda_") + kind + "_" + kLevelNames[level] + "_" + name;
 }
 
+/// Where the loader has put an image.
+AddressRange FindRange(void* object, const void* image) {
+    const link_map* map = nullptr;
+    if (dlinfo(object, RTLD_DI_LINKMAP, &map) != 0) return {};
+    Elf64_Ehdr header;
+    std::memcpy(&header, image, sizeof header);
+    std::size_t bytes = 0;
+    for (int i = 0; i < header.e_phnum; ++i) {
+        Elf64_Phdr segment;
+        std::memcpy(&segment, static_cast<const char*>(image) + header.e_phoff + i * sizeof segment, sizeof segment);
+        if (segment.p_type == PT_LOAD) bytes = std::max(bytes, segment.p_vaddr + segment.p_memsz);
+    }
+    return {map->l_addr, map->l_addr + bytes};
+}
+
 CUresult LoadImage(CUmodule* result, const void* image) {
     CUcontext context = nullptr;
     if (const CUresult fault = NeedContext(context); fault != CUDA_SUCCESS) return fault;
@@ -80,6 +96,7 @@ CUresult LoadImage(CUmodule* result, const void* image) {
         SetMessage(dlerror());
         return CUDA_ERROR_INVALID_IMAGE;
     }
+    module->range = FindRange(module->object, image);
     *result = module.get();
     const std::lock_guard<std::mutex> lock(context->mutex);
     context->modules.insert(std::move(module));
@@ -99,6 +116,7 @@ CUresult Start(Launch& launch, CUfunction function, unsigned parameterBytes, CUs
     if (const CUresult result = FindStream(handle, stream); result != CUDA_SUCCESS) return result;
     launch.kernel = function->kernel;
     launch.level = function->level;
+    launch.module = function->module;
     if (parameterBytes != function->kernel->parameterBytes) {
         SetMessage(std::string("kernel ") + function->kernel->name + " takes " +
                    std::to_string(function->kernel->parameterBytes) + " bytes of arguments, not " +
@@ -192,6 +210,7 @@ CUresult cuModuleGetFunction(CUfunction* function, CUmodule module, const char* 
         made = std::make_unique<CUfunc_st>();
         made->kernel = kernel;
         made->level = module->level;
+        made->module = module->range;
     }
     *function = made.get();
     return CUDA_SUCCESS;

@@ -125,8 +125,7 @@ CUresult cuEventRecord(CUevent event, CUstream handle) {
     if (const CUresult result = FindStream(handle, stream); result != CUDA_SUCCESS) return result;
     const auto record = std::make_shared<CUevent_st::Record>();
     record->point.stream = stream->stream;
-    record->point.ticket =
-        stream->stream->Submit([time = record->time] { *time = CUevent_st::Clock::now(); }, GetDependencies(*stream));
+    record->point.ticket = stream->stream->Submit(record->time, GetDependencies(*stream));
     const std::lock_guard<std::mutex> lock(event->mutex);
     event->record = record;
     return CUDA_SUCCESS;

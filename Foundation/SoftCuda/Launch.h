@@ -17,6 +17,14 @@ constexpr int kFrameRoles = 5;
 constexpr int kTargetFrame = 0;
 constexpr int kWorkFrame = 4;
 
+/// Bytes from begin to before end.
+struct AddressRange {
+    std::uintptr_t begin = 0;
+    std::uintptr_t end = 0;
+
+    [[nodiscard]] bool Overlaps(const AddressRange& other) const { return begin < other.end && other.begin < end; }
+};
+
 struct FrameUse {
     std::uint8_t* base = nullptr;  ///< null: the kernel has no such frame
     int pitch = 0;                 ///< in pixels
@@ -28,6 +36,7 @@ struct FrameUse {
 struct Launch {
     const KernelRecord* kernel = nullptr;
     int level = 0;
+    AddressRange module;  ///< where the kernel's module lies, its globals included
     int threadsX = 0;
     int threadsY = 0;
     alignas(16) std::array<unsigned char, kMaxParameterBytes> parameters;

@@ -27,12 +27,12 @@ struct CUstream_st {
 };
 
 struct CUevent_st {
-    using Clock = std::chrono::steady_clock;
-    /// One recording; the stream writes the time before it reaches the point. The time is held apart because queued work
-    /// must not hold on to its own stream.
+    using Clock = SoftCuda::Stream::Clock;
+    /// One recording; the stream writes the time before it reaches the point. The time is held apart because queued
+    /// work must not hold on to its own stream.
     struct Record {
         SoftCuda::StreamPoint point;
-        std::shared_ptr<Clock::time_point> time = std::make_shared<Clock::time_point>();
+        SoftCuda::Stream::Stamp time = std::make_shared<Clock::time_point>();
     };
     CUcontext context = nullptr;
     std::mutex mutex;  ///< of the pointer
@@ -47,6 +47,7 @@ struct CUevent_st {
 struct CUfunc_st {
     const SoftCuda::KernelRecord* kernel = nullptr;
     int level = 0;
+    SoftCuda::AddressRange module;
     // Set by the older entries and kept until set again, as the API has it.
     int block[3] = {1, 1, 1};
     unsigned parameterBytes = 0;
@@ -56,9 +57,10 @@ struct CUfunc_st {
 struct CUmod_st {
     CUcontext context = nullptr;
     int level = 0;
-    int file = -1;           ///< stays open: the loader tells objects apart by its name
-    void* object = nullptr;  ///< of the dynamic loader
-    std::mutex mutex;        ///< of the functions
+    int file = -1;                 ///< stays open: the loader tells objects apart by its name
+    void* object = nullptr;        ///< of the dynamic loader
+    SoftCuda::AddressRange range;  ///< where it lies
+    std::mutex mutex;              ///< of the functions
     std::map<std::string, std::unique_ptr<CUfunc_st>> functions;
 
     CUmod_st() = default;

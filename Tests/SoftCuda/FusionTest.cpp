@@ -150,6 +150,57 @@ TEST_F(FusionTest, AChainInPlaceTakesOnePassAndAnythingElseEndsIt) {
     EXPECT_EQ(Api().cuStreamDestroy_v2(stream), CUDA_SUCCESS);
 }
 
+TEST_F(FusionTest, RecordsAndMarksMayComeBetweenLaunchesOfOnePass) {
+    constexpr int kSize = 512;
+    DeviceFrame frame(kSize, kSize, kSize, 1), other(kSize, kSize, kSize, 1);
+    CUmodule second = nullptr;
+    CUdeviceptr offsets = 0, unrelated = 0;
+    std::size_t bytes = 0;
+    ASSERT_EQ(Api().cuModuleLoadData(&second, FindImage("TestKernels")), CUDA_SUCCESS);
+    ASSERT_EQ(Api().cuModuleGetGlobal_v2(&offsets, &bytes, mModule, "offsets"), CUDA_SUCCESS);
+    ASSERT_EQ(Api().cuModuleGetGlobal_v2(&unrelated, &bytes, second, "offsets"), CUDA_SUCCESS);
+    CUstream stream = nullptr;
+    CUevent marks[3] = {};
+    ASSERT_EQ(Api().cuStreamCreate(&stream, CU_STREAM_NON_BLOCKING), CUDA_SUCCESS);
+    for (CUevent& mark : marks) ASSERT_EQ(Api().cuEventCreate(&mark, 0), CUDA_SUCCESS);
+
+    // Each round: offset, gain, offset, with a record written in between; the sum tells their order.
+    const auto run = [&](CUdeviceptr record) {
+        frame.Write(std::vector<Pixel>(kSize * kSize, Pixel{}));
+        float values[5] = {1, 0, 0, 0, 0};
+        EXPECT_EQ(Api().cuMemcpyHtoD_v2(offsets, values, sizeof values), CUDA_SUCCESS);
+        // A large copy in front lets all that follows queue up behind it.
+        for (int i = 0; i < 20; ++i)
+            EXPECT_EQ(Api().cuMemcpyDtoDAsync_v2(other.data, frame.data, kSize * kSize * 16, stream), CUDA_SUCCESS);
+        const SoftCudaCounters before = ReadCounters();
+        EXPECT_EQ(Api().cuEventRecord(marks[0], stream), CUDA_SUCCESS);
+        const Arguments add(frame.data, kSize, 1, kSize, kSize, 0, CUdeviceptr{0});
+        EXPECT_EQ(Launch("OffsetKernel", kSize, kSize, add, stream), CUDA_SUCCESS);
+        values[0] = 5;
+        EXPECT_EQ(Api().cuMemcpyHtoDAsync_v2(record, values, sizeof values, stream), CUDA_SUCCESS);
+        values[0] = 1000;  // pageable memory has been taken
+        EXPECT_EQ(
+            Launch("GainKernel", kSize, kSize, Arguments(frame.data, kSize, 1, kSize, kSize, 10.0F, 0.0F), stream),
+            CUDA_SUCCESS);
+        EXPECT_EQ(Api().cuEventRecord(marks[1], stream), CUDA_SUCCESS);
+        EXPECT_EQ(Launch("OffsetKernel", kSize, kSize, add, stream), CUDA_SUCCESS);
+        EXPECT_EQ(Api().cuEventRecord(marks[2], stream), CUDA_SUCCESS);
+        EXPECT_EQ(Api().cuStreamSynchronize(stream), CUDA_SUCCESS);
+        EXPECT_EQ(frame.Read()[kSize * kSize - 1].value[2], record == offsets ? 15.0F : 11.0F);
+        return ReadCounters().fused - before.fused;
+    };
+    EXPECT_EQ(run(unrelated), 2U);
+    // The times of marks within a pass grow in their order.
+    float first = -1, last = -1;
+    EXPECT_EQ(Api().cuEventElapsedTime(&first, marks[0], marks[1]), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuEventElapsedTime(&last, marks[1], marks[2]), CUDA_SUCCESS);
+    EXPECT_GT(first, 0);
+    EXPECT_GT(last, 0);
+    EXPECT_EQ(run(offsets), 1U);
+    for (CUevent mark : marks) EXPECT_EQ(Api().cuEventDestroy_v2(mark), CUDA_SUCCESS);
+    EXPECT_EQ(Api().cuStreamDestroy_v2(stream), CUDA_SUCCESS);
+}
+
 TEST_F(FusionTest, ALoneLaunchBeginsByItself) {
     DeviceFrame frame(32, 32, 32, 1);
     CUstream stream = nullptr;

@@ -11,6 +11,8 @@
 #include "SoftCuda/Half.h"
 #include "SoftCuda/KernelAbi.h"
 
+struct TextureDescriptor;
+
 // The level is part of the names' type, so that the three copies of a module in one object share no weak symbol.
 inline namespace DIALECT_LEVEL {
 
