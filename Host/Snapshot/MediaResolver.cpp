@@ -161,8 +161,7 @@ ResolvedMedia MediaResolver::Offline(const Item& clip, const SequenceFormat& for
     resolved.start = clip.media.availableRange ? clip.media.availableRange->start : 0;
     resolved.offline = true;
     resolved.instance = clip.media.file;
-    const std::string what = clip.media.file.empty() ? "\"" + clip.name + "\"" : clip.media.file;
-    const std::string line = clip.media.path + ": " + what + ": " + reason;
+    const std::string line = clip.media.path + ": \"" + clip.name + "\": " + reason;
     if (std::find(mOffline.begin(), mOffline.end(), line) == mOffline.end()) mOffline.push_back(line);
     return resolved;
 }

@@ -1,0 +1,86 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <fstream>
+#include <sstream>
+
+#include "Host/Inspect/SegmentsJson.h"
+#include "Tests/Host/EngineWalk.h"
+#include "Tests/Host/TimelineText.h"
+
+/// Files that other programs wrote.
+namespace Vantrel::Host::Test {
+namespace {
+
+const std::string kData = VANTREL_TEST_DATA;
+
+std::string ReadText(const std::string& path) {
+    std::ostringstream text;
+    text << std::ifstream(path).rdbuf();
+    return text.str();
+}
+
+/// A sample under a name that is the same on every machine: relative references count from it.
+Document ReadSample(const std::string& name) {
+    return ReadTimelineText(ReadText(kData + "/otio/" + name + ".otio"), "/samples/" + name + ".otio");
+}
+
+struct Sample {
+    const char* name;
+    std::int64_t length;
+    std::size_t segments;
+};
+constexpr Sample kSamples[] = {
+    {"simple_cut", 19, 4},      {"transition", 19, 5},   {"multiple_track", 19, 6},           {"clip_example", 19, 2},
+    {"nested_example", 636, 7}, {"multitrack", 3282, 8}, {"generator_reference_test", 50, 1}, {"big_int", 24, 1}};
+
+TEST(Samples, AreDividedIntoTheirSegments) {
+    for (const Sample& sample : kSamples) {
+        const Described described(ReadSample(sample.name));
+        EXPECT_EQ(described.snapshot->top->length, sample.length * kFrame) << sample.name;
+        EXPECT_EQ(described.Segments().size(), sample.segments) << sample.name;
+        EXPECT_EQ(described.snapshot->top->format.frameTicks, kFrame) << sample.name;
+        for (const auto& [id, sequence] : described.snapshot->sequences) {
+            const std::size_t expected = id == 1 ? sample.segments : 1;
+            EXPECT_EQ(sequence->plain.segments.size(), expected) << sample.name << " " << sequence->path;
+        }
+    }
+}
+
+TEST(Samples, AFreezeInsideIsLeftToTheHost) {
+    const Described described(ReadSample("nested_example"));
+    std::size_t nested = 0;
+    std::size_t rendered = 0;
+    for (const Segment& segment : described.Segments()) {
+        const Node& media = *segment.root->inputs.front().node->inputs.front().node;
+        if (!std::holds_alternative<NestedSource>(media.AsMedia()->clip->source)) continue;
+        (media.FindProperty("MediaNode::NestedSequenceTimelineID") != nullptr ? nested : rendered) += 1;
+    }
+    EXPECT_EQ(nested, 2U);
+    EXPECT_EQ(rendered, 1U);
+}
+
+/// With VANTREL_UPDATE_GOLDEN set the files are written anew, to be read and committed.
+TEST(Samples, AreDescribedAsTheyWere) {
+    for (const char* name : {"transition", "multiple_track", "nested_example", "generator_reference_test"}) {
+        Document document = ReadSample(name);
+        FakeProbe probe;
+        for (const auto& [file, frames] : {std::pair{"titles", 8}, {"wind-up", 9}, {"punchline", 10}}) {
+            MediaInfo info = FakeProbe::Usual();
+            info.frameCount = frames;
+            probe.infos["/folder/" + std::string(file) + ".mov"] = info;
+        }
+        IdentityBook identities;  // numbers count from the beginning
+        const SnapshotPtr snapshot = BuildSnapshot(document, {}, probe, identities);
+        const std::string described = SegmentsToJson(*snapshot, {}).dump(2) + "\n";
+        const std::string path = kData + "/segments/" + name + ".json";
+        if (std::getenv("VANTREL_UPDATE_GOLDEN") != nullptr) std::ofstream(path) << described;
+        EXPECT_EQ(ReadText(path), described) << path;
+    }
+}
+
+}  // namespace
+}  // namespace Vantrel::Host::Test
