@@ -21,6 +21,7 @@ public:
                 return Clip(node, node.AsItem()->time.AtItemTime(time), node.operators.size());
             case NodeKind::kMedia:
             case NodeKind::kPreview:
+            case NodeKind::kSolidColor:
                 return Media(*node.AsMedia(), time);
             case NodeKind::kTransition:
                 Transition(node, time);

@@ -105,6 +105,10 @@ NodePtr LayerNodes::LayerNode(const ActiveLayer& layer, const MatteLookup& matte
     const Placement& placement = *layer.placement;
     if (placement.item != nullptr) {
         if (IsGrid(layer)) return GridNode(*placement.item, layer.trackID);
+        const Item& item = *placement.item->item;
+        if (item.options.forceHost && item.enabled && item.media.kind == ReferenceKind::kGenerator) {
+            return mFactory.HostSolid(mSequences.GetMedia().Resolve(item, mFormat).clip);
+        }
         const NodePtr clip = ClipNode(*placement.item, layer.trackID, mattes);
         return placement.item->item->enabled ? clip : mFactory.Disabled(clip);
     }

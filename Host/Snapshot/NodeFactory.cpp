@@ -312,6 +312,15 @@ NodePtr NodeFactory::Multicam(const Host::Multicam& options, std::vector<NodeInp
     return Finish(std::move(node));
 }
 
+NodePtr NodeFactory::HostSolid(const MediaClipPtr& clip) const {
+    Node node;
+    node.kind = NodeKind::kSolidColor;
+    MediaDetail detail;
+    detail.clip = clip;
+    node.detail = detail;
+    return Finish(std::move(node));
+}
+
 NodePtr NodeFactory::Preview(const MediaClipPtr& clip) const {
     Node node;
     node.kind = NodeKind::kPreview;

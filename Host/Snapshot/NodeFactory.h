@@ -55,6 +55,8 @@ public:
     [[nodiscard]] NodePtr Disabled(const NodePtr& clip) const;
     [[nodiscard]] NodePtr Adjustment(const NodePtr& below, const NodePtr& clip) const;
     [[nodiscard]] NodePtr Multicam(const Multicam& options, std::vector<NodeInput> angles) const;
+    /// A colour that the engine leaves to the host, and with it the whole segment.
+    [[nodiscard]] NodePtr HostSolid(const MediaClipPtr& clip) const;
     [[nodiscard]] NodePtr Preview(const MediaClipPtr& clip) const;
 
 private:

@@ -83,6 +83,7 @@ LayerPicture NodeRenderer::RenderLayer(const Node& node, std::int64_t time, cons
             return RenderClip(node, node.AsItem()->time.AtItemTime(time), node.operators.size(), view);
         case NodeKind::kMedia:
         case NodeKind::kPreview:
+        case NodeKind::kSolidColor:
             return mMedia.Render(node, time, view);
         case NodeKind::kCompositor:
             return AsLayer(Composite(node, time, view), view);
@@ -94,8 +95,6 @@ LayerPicture NodeRenderer::RenderLayer(const Node& node, std::int64_t time, cons
             return AsLayer(Tile(node, time, view), view);
         case NodeKind::kDisabled:
             return AsLayer(RenderInput(node.inputs.at(0), time, view), view);
-        case NodeKind::kSolidColor:
-            return AsLayer(Picture(view.width, view.height), view);
         case NodeKind::kEffect:
             break;
     }

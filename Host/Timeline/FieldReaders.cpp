@@ -143,7 +143,7 @@ void ReadItemOptions(const JsonCursor& object, Item& item) {
     const auto own = FindOwnMetadata(object);
     if (!own) return;
     own->WarnOfOthers({"hold_filters", "hold", "time_remap", "frame_blend", "deinterlace", "reverse_field_dominance",
-                       "alpha", "scale_to_frame", "disabled", "sequence", "multicam"});
+                       "alpha", "scale_to_frame", "disabled", "force_host", "sequence", "multicam"});
     ItemOptions& options = item.options;
     if (const auto flag = own->Find("hold_filters")) options.holdFilters = flag->Bool();
     if (const auto flag = own->Find("frame_blend")) options.frameBlend = flag->Bool();
@@ -162,6 +162,7 @@ void ReadItemOptions(const JsonCursor& object, Item& item) {
         options.scale = static_cast<ScalePolicy>(scale->Choice({"none", "fit", "fill", "stretch"}));
     }
     if (const auto disabled = own->Find("disabled")) options.keepDisabled = disabled->Choice({"omit", "node"}) == 1;
+    if (const auto force = own->Find("force_host")) options.forceHost = force->Bool();
     const bool composition = item.kind == ItemKind::kStack || item.kind == ItemKind::kTrack;
     if (const auto sequence = own->Find("sequence")) {
         if (composition) {

@@ -99,6 +99,8 @@ struct ItemOptions {
     ScalePolicy scale = ScalePolicy::kFit;
     /// A disabled item stays in the tree as a layer that shows nothing.
     bool keepDisabled = false;
+    /// A generator of one colour is described as something that only the host can draw.
+    bool forceHost = false;
 };
 
 struct Multicam {

@@ -49,6 +49,9 @@ TEST(Constructs, GeneratorsFallThroughToTheirKeys) {
         EXPECT_EQ(Property(media, "MediaNode::MediaIsOffline"), "0");
         EXPECT_EQ(media.flags, kNodeFlag_Still);
     }
+    const Described forced = OneClip(GeneratorOf("black"), Own({{"force_host", true}}));
+    EXPECT_EQ(LayerOf(forced).kind, NodeKind::kSolidColor);
+    EXPECT_TRUE(LayerOf(forced).inputs.empty());
     const Described title = OneClip(GeneratorOf("title", {{"text", "x"}}));
     EXPECT_NE(Property(MediaOf(title), "MediaNode::ClipID"), "(fails)");
     EXPECT_EQ(MediaOf(title).flags, kNodeFlag_Still);
@@ -114,6 +117,17 @@ TEST(Constructs, MediaTellTheirStream) {
     EXPECT_TRUE(node.AsMedia()->samplesTime);
     EXPECT_EQ(snapshot->nativeSubType, info.codecTag);
     EXPECT_EQ(snapshot->top->format.width, 1280);
+}
+
+TEST(Constructs, OnlyARemappedClipSaysSo) {
+    const auto key = [](double t, double media) { return Json{{"t", Time(t)}, {"media", Time(media)}}; };
+    const Described described = OneClip(File("x.mov"), Own({{"time_remap", {key(0, 0), key(10, 30)}}}));
+    const Node& clip = LayerOf(described);
+    EXPECT_EQ(Property(clip, "ClipNode::TimeRemapping"), "1");
+    EXPECT_EQ(Property(clip, "ClipNode::ClipSpeed"), "3");
+    EXPECT_EQ(clip.inputs.at(0).offset, 0);
+    EXPECT_EQ(clip.TransformTime(5 * kFrame), 15 * kFrame);
+    EXPECT_EQ(Property(LayerOf(OneClip(File("x.mov"))), "ClipNode::TimeRemapping"), "(fails)");
 }
 
 TEST(Constructs, OperatorsStandInTheOrderOfTheTreeAndStillsKeepThem) {
