@@ -48,7 +48,7 @@ Picture RandomPicture(Random& random, int width, int height) {
     for (std::size_t i = 0; i < picture.pixels.size(); i += 4) {
         for (std::size_t c = 0; c < 3; ++c) picture.pixels[i + c] = random.Uniform(-0.25F, 1.5F);
         const int kind = random.Int(0, 3);
-        picture.pixels[i + 3] = kind == 0 ? 0.0F : kind == 1 ? 1.0F : random.Uniform(0.0F, 1.0F);
+        picture.pixels[i + 3] = kind == 0 ? 0.0F : kind == 1 ? 1.0F : random.Uniform(0.01F, 1.0F);
     }
     return picture;
 }

@@ -38,7 +38,7 @@ private:
     std::mt19937 mEngine;
 };
 
-/// Noise: colours from below 0 to above 1, alpha 0, 1 and all between.
+/// Noise: colours from below 0 to above 1, alpha 0, 1 and between, but for the least that a division would make huge.
 [[nodiscard]] Picture RandomPicture(Random& random, int width, int height);
 /// The same with alpha 1.
 [[nodiscard]] Picture RandomOpaquePicture(Random& random, int width, int height);

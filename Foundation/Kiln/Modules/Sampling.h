@@ -142,11 +142,12 @@ DEVICE_FUNCTION void RestrainLanes(Lanes4* pixels, AnyFrame in, int format, Regi
         int index[LANES], counts[LANES];
         EACH_LANE(i) {
             const int column = FirstTap(across, u[i]) + tap % across.taps, row = FirstTap(down, v[i]) + tap / across.taps;
-            const float weight = FilterWeight(FILTER_BICUBIC, ((float)column + 0.5f - u[i]) * across.inverse) *
-                                 FilterWeight(FILTER_BICUBIC, ((float)row + 0.5f - v[i]) * down.inverse);
+            const float fromColumn = Abs((float)column + 0.5f - u[i]) * across.inverse;
+            const float fromRow = Abs((float)row + 0.5f - v[i]) * down.inverse;
             index[i] = (region.top + ClampInt(row, 0, region.height - 1)) * region.pitch + region.left +
                        ClampInt(column, 0, region.width - 1);
-            counts[i] = weight != 0.0f;
+            // Just short of the filter's end at 2, where rounding would decide.
+            counts[i] = Max(fromColumn, fromRow) < 1.99f;
         }
         Lanes4 taps;
         FetchLanes(&taps, in, format, index);
@@ -164,6 +165,9 @@ DEVICE_FUNCTION void RestrainLanes(Lanes4* pixels, AnyFrame in, int format, Regi
     }
 }
 
+/// Lines that one thread samples of a picture that isn't turned: neighbouring ones share most of what they read.
+#define TILE_LINES 8
+
 #if defined(DIALECT_LEVEL)
 #include "Kiln/Modules/SamplingCpu.h"
 #else
@@ -172,25 +176,26 @@ DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region
     SampleTaps(sum, in, format, region, filter, across, down, u, v);
 }
 
-/// As SampleFiltered for positions along a line: all at the same v, equally far apart.
-DEVICE_FUNCTION void SampleLine(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across, Reach down,
-                                const float* u, const float* v) {
+typedef struct Tile {
+    int unused;
+} Tile;
+
+/// Makes ready to sample lines at the positions u from firstV to lastV.
+DEVICE_FUNCTION void BeginTile(Tile* tile, AnyFrame in, int format, Region region, int filter, Reach across, Reach down,
+                               const float* u, float firstV, float lastV) {
+    tile->unused = 0;
+}
+
+/// As SampleFiltered for one of the tile's lines: v is the same for all lanes.
+DEVICE_FUNCTION void SampleTileLine(Lanes4* sum, const Tile* tile, AnyFrame in, int format, Region region, int filter,
+                                    Reach across, Reach down, const float* u, const float* v) {
     SampleTaps(sum, in, format, region, filter, across, down, u, v);
 }
 #endif
 
-/// The picture at LANES positions, straight.
-/// @param inLine the positions lie along a line
-DEVICE_FUNCTION void SampleLanes(Lanes4* pixels, AnyFrame in, int format, Region region, int filter, Reach across,
-                                 Reach down, const float* u, const float* v, int inLine) {
-    if (filter == FILTER_NEAREST) {
-        SampleNearest(pixels, in, format, region, u, v);
-        return;
-    }
-    if (inLine != 0)
-        SampleLine(pixels, in, format, region, filter, across, down, u, v);
-    else
-        SampleFiltered(pixels, in, format, region, filter, across, down, u, v);
+/// Makes sums straight.
+DEVICE_FUNCTION void FinishLanes(Lanes4* pixels, AnyFrame in, int format, Region region, int filter, Reach across,
+                                 Reach down, const float* u, const float* v) {
     StraightenLanes(pixels);
     if (filter == FILTER_BICUBIC) RestrainLanes(pixels, in, format, region, across, down, u, v);
 }

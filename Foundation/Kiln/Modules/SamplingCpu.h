@@ -3,15 +3,16 @@
 #pragma once
 
 /// The CPU's way to filter: a filter's taps lie side by side in memory, so two pixels are taken with one load, and no lane
-/// waits for a gather. A turned picture costs a fifth of the way tap by tap; on a line the sums down the columns are
-/// shared by all lanes. See Sampling.h for what the functions do.
+/// waits for a gather. Where the picture isn't turned, a tile of it is premultiplied once for several lines, and the sums
+/// down its columns are shared by all lanes. See Sampling.h for what the functions do.
 
 typedef float Vector8 __attribute__((vector_size(32)));
 typedef int Index8 __attribute__((vector_size(32)));
 
 /// A filter that reaches further is sampled tap by tap.
 #define MOST_TAPS 32
-#define MOST_COLUMNS (LANES * 6 + 2 * MOST_TAPS)
+#define MOST_TILE_PIXELS 8192
+#define MOST_TILE_COLUMNS 512
 
 typedef struct LaneTaps {
     int first[LANES];
@@ -122,71 +123,108 @@ DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region
     SampleTaps(sum, in, format, region, filter, across, down, u, v);
 }
 
-typedef struct RowTaps {
-    int index[MOST_TAPS];  // of the row's first pixel
-    float weight[MOST_TAPS];
-} RowTaps;
+/// A part of the region, premultiplied; where it goes beyond the region the border goes on.
+typedef struct Tile {
+    int low, columns;  // its first column, and how many
+    int top;           // its first row
+    int pairs;         // of taps across; 0 when the part is too large to be held
+    int first[LANES];
+    Vector8 weights[LANES][MOST_TAPS / 2];
+    Vector4 pixels[MOST_TILE_PIXELS];
+} Tile;
 
-DEVICE_FUNCTION void WeighRows(RowTaps* rows, int filter, Reach reach, Region region, float v) {
-    const int first = FirstTap(reach, v);
-    float total = 0.0f;
-    for (int j = 0; j < reach.taps; ++j) {
-        rows->index[j] = (region.top + ClampInt(first + j, 0, region.height - 1)) * region.pitch + region.left;
-        rows->weight[j] = FilterWeight(filter, ((float)(first + j) + 0.5f - v) * reach.inverse);
-        total += rows->weight[j];
+DEVICE_FUNCTION void FillTileRow(Vector4* row, AnyFrame in, int format, Region region, int line, int low, int columns) {
+    const int from = ClampInt(low, 0, region.width - 1), to = ClampInt(low + columns, from + 1, region.width);
+    const uchar* address = PixelAddress(in, format, line + from);
+    int column = from - low;
+    for (; column + 1 < to - low; column += 2, address += 2 * PixelBytes(format)) {
+        const Vector8 pair = LoadWeighedPair(address, format);
+        __builtin_memcpy(&row[column], &pair, sizeof pair);
     }
-    if (reach.stretch <= 1.0f) return;
-    for (int j = 0; j < reach.taps; ++j) rows->weight[j] /= total;
+    if (column < to - low) row[column] = LoadWeighed(in, format, line + low + column);
+    for (int c = 0; c < from - low; ++c) row[c] = row[from - low];
+    for (int c = to - low; c < columns; ++c) row[c] = row[to - low - 1];
 }
 
-/// The rows' sums for the columns `low` to `high`, which may lie outside.
-DEVICE_FUNCTION void SumColumns(Vector4* columns, AnyFrame in, int format, Region region, const RowTaps* rows,
-                                int count, int low, int high) {
-    const int from = ClampInt(low, 0, region.width - 1), to = ClampInt(high, from + 1, region.width);
-    int column = from;
-    for (; column + 1 < to; column += 2) {
-        Vector8 pair = {};
-        for (int j = 0; j < count; ++j)
-            pair += LoadWeighedPair(PixelAddress(in, format, rows->index[j] + column), format) * rows->weight[j];
-        __builtin_memcpy(&columns[column - low], &pair, sizeof pair);
-    }
-    if (column < to) {
-        Vector4 last = {};
-        for (int j = 0; j < count; ++j) last += LoadWeighed(in, format, rows->index[j] + column) * rows->weight[j];
-        columns[column - low] = last;
-    }
-    for (int c = low; c < from; ++c) columns[c - low] = columns[from - low];
-    for (int c = to; c < high; ++c) columns[c - low] = columns[to - 1 - low];
-}
-
-DEVICE_FUNCTION void SampleLine(Lanes4* sum, AnyFrame in, int format, Region region, int filter,
-                                Reach across, Reach down, const float* u, const float* v) {
+DEVICE_FUNCTION void BeginTile(Tile* tile, AnyFrame in, int format, Region region, int filter, Reach across, Reach down,
+                               const float* u, float firstV, float lastV) {
     const int taps = (across.taps + 1) & ~1;
     const int low = FirstTap(across, Min(u[0], u[LANES - 1])), high = FirstTap(across, Max(u[0], u[LANES - 1])) + taps;
-    if (taps > MOST_TAPS || down.taps > MOST_TAPS || high - low > MOST_COLUMNS || low >= region.width || high <= 0) {
+    const int top = FirstTap(down, Min(firstV, lastV)), bottom = FirstTap(down, Max(firstV, lastV)) + down.taps;
+    const int columns = (high - low + 1) & ~1;
+    tile->pairs = 0;
+    if (taps > MOST_TAPS || down.taps > MOST_TAPS || columns > MOST_TILE_COLUMNS || low >= region.width || high <= 0) return;
+    if (columns * (bottom - top) > MOST_TILE_PIXELS) return;
+    tile->low = low;
+    tile->columns = columns;
+    tile->top = top;
+    tile->pairs = taps / 2;
+    LaneTaps lanes;
+    WeighTaps(&lanes, filter, across, taps, u);
+    EACH_LANE(i) tile->first[i] = lanes.first[i] - low;
+    for (int i = 0; i < LANES; ++i)
+        for (int k = 0; k < taps / 2; ++k) tile->weights[i][k] = WeightsOfPair(&lanes, 2 * k, i);
+    for (int row = top; row < bottom; ++row) {
+        const int line = (region.top + ClampInt(row, 0, region.height - 1)) * region.pitch + region.left;
+        FillTileRow(&tile->pixels[(row - top) * columns], in, format, region, line, low, columns);
+    }
+}
+
+/// Sums down the tile's columns.
+DEVICE_FUNCTION void SumColumns(Vector4* sums, const Tile* tile, int filter, Reach down, float v, int taps) {
+    const int first = FirstTap(down, v);
+    float weights[MOST_TAPS];
+    float total = 0.0f;
+    for (int j = 0; j < taps; ++j) {
+        weights[j] = FilterWeight(filter, ((float)(first + j) + 0.5f - v) * down.inverse);
+        total += weights[j];
+    }
+    if (down.stretch > 1.0f)
+        for (int j = 0; j < taps; ++j) weights[j] /= total;
+    const Vector4* corner = &tile->pixels[(first - tile->top) * tile->columns];
+    for (int c = 0; c < tile->columns; c += 2) {
+        Vector8 sum = {};
+        for (int j = 0; j < taps; ++j) {
+            Vector8 pair;
+            __builtin_memcpy(&pair, corner + j * tile->columns + c, sizeof pair);
+            sum += pair * weights[j];
+        }
+        __builtin_memcpy(&sums[c], &sum, sizeof sum);
+    }
+}
+
+DEVICE_FUNCTION void SumPairs(Vector4* pixels, const Vector4* columns, const Tile* tile, int pairs) {
+    for (int i = 0; i < LANES; ++i) {
+        const Vector4* reached = &columns[tile->first[i]];
+        Vector8 sum = {};
+        for (int k = 0; k < pairs; ++k) {
+            Vector8 pair;
+            __builtin_memcpy(&pair, reached + 2 * k, sizeof pair);
+            sum += pair * tile->weights[i][k];
+        }
+        pixels[i] = AddHalves(sum);
+    }
+}
+
+DEVICE_FUNCTION void SampleTileLine(Lanes4* sum, const Tile* tile, AnyFrame in, int format, Region region, int filter,
+                                    Reach across, Reach down, const float* u, const float* v) {
+    if (tile->pairs == 0) {
         SampleTaps(sum, in, format, region, filter, across, down, u, v);
         return;
     }
-    LaneTaps tapsAcross;
-    RowTaps rows;
-    Vector4 columns[MOST_COLUMNS], pixels[LANES];
-    WeighTaps(&tapsAcross, filter, across, taps, u);
-    WeighRows(&rows, filter, down, region, v[0]);
+    Vector4 columns[MOST_TILE_COLUMNS], pixels[LANES];
+    // The commonest sizes with their bounds known, so that the loops over taps are unrolled.
     if (down.taps == 4)
-        SumColumns(columns, in, format, region, &rows, 4, low, high);
+        SumColumns(columns, tile, filter, down, v[0], 4);
     else if (down.taps == 2)
-        SumColumns(columns, in, format, region, &rows, 2, low, high);
+        SumColumns(columns, tile, filter, down, v[0], 2);
     else
-        SumColumns(columns, in, format, region, &rows, down.taps, low, high);
-    for (int i = 0; i < LANES; ++i) {
-        const Vector4* reached = &columns[tapsAcross.first[i] - low];
-        Vector8 pixel = {};
-        for (int k = 0; k < taps; k += 2) {
-            Vector8 pair;
-            __builtin_memcpy(&pair, reached + k, sizeof pair);
-            pixel += pair * WeightsOfPair(&tapsAcross, k, i);
-        }
-        pixels[i] = AddHalves(pixel);
-    }
+        SumColumns(columns, tile, filter, down, v[0], down.taps);
+    if (tile->pairs == 2)
+        SumPairs(pixels, columns, tile, 2);
+    else if (tile->pairs == 1)
+        SumPairs(pixels, columns, tile, 1);
+    else
+        SumPairs(pixels, columns, tile, tile->pairs);
     PutLanes(sum, pixels);
 }

@@ -30,4 +30,10 @@ enum class Filter : std::int32_t { kNearest = 0, kBilinear = 1, kBicubic = 2 };
     return quality == Vellum::RenderQuality::kMedium ? Filter::kBilinear : Filter::kBicubic;
 }
 
+/// Of a kernel whose threads make TILE_LINES lines each; the number is that of Modules/Sampling.h.
+[[nodiscard]] inline LaunchShape TileShapeFor(std::int32_t width, std::int32_t height) {
+    constexpr std::int32_t kTileLines = 8;
+    return ShapeFor(width, (height + kTileLines - 1) / kTileLines);
+}
+
 }  // namespace Kiln

@@ -19,6 +19,11 @@ constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int
                  std::int32_t, std::int32_t>
     kMotion{kModule, "MotionKernel"};
 constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t,
+                 DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t, float, float,
+                 float, float, float, float, float, float, Filter, float, std::int32_t, bool, std::int32_t,
+                 std::int32_t>
+    kUprightMotion{kModule, "UprightMotionKernel"};
+constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t,
                  DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, float, std::int32_t, bool, std::int32_t,
                  std::int32_t>
     kPlace{kModule, "PlaceKernel"};
@@ -63,13 +68,23 @@ Ostrand::Status DrawPlaced(const DeviceRef& device, const Side& source, const Si
     const LayerAxis& a = placement.across;
     const LayerAxis& d = placement.down;
     const auto narrow = [](double value) { return static_cast<float>(value); };
+    const Filter filter = placement.isPixelExact ? Filter::kNearest : look.filter;
+    if (a.y == 0.0 && d.x == 0.0 && filter != Filter::kNearest) {
+        return kUprightMotion.Launch(device, TileShapeFor(box.Width(), box.Height()), look.format, target.buffer,
+                                     target.pitch, geometry.target.left + box.left, geometry.target.top + box.top,
+                                     box.Width(), box.Height(), source.buffer, source.pitch, geometry.source.left,
+                                     geometry.source.top, geometry.source.Width(), geometry.source.Height(),
+                                     narrow(a.x), narrow(a.start), narrow(a.length), narrow(a.step), narrow(d.y),
+                                     narrow(d.start), narrow(d.length), narrow(d.step), filter, look.opacity,
+                                     look.blendMode, look.overDestination, box.left, box.top);
+    }
     return kMotion.Launch(device, ShapeFor(box.Width(), box.Height()), look.format, target.buffer, target.pitch,
                           geometry.target.left + box.left, geometry.target.top + box.top, box.Width(), box.Height(),
                           source.buffer, source.pitch, geometry.source.left, geometry.source.top,
                           geometry.source.Width(), geometry.source.Height(), narrow(a.x), narrow(a.y), narrow(a.start),
                           narrow(a.length), narrow(a.step), narrow(d.x), narrow(d.y), narrow(d.start), narrow(d.length),
-                          narrow(d.step), placement.isPixelExact ? Filter::kNearest : look.filter, look.opacity,
-                          look.blendMode, look.overDestination, box.left, box.top);
+                          narrow(d.step), filter, look.opacity, look.blendMode, look.overDestination, box.left,
+                          box.top);
 }
 
 bool AreFinite(std::initializer_list<float> values) {

@@ -21,7 +21,7 @@ bool IsOpaque(PixelFormat format) { return format == kPixelFormat_GPU_BGRX_4444_
 
 Ostrand::Status ScaleView(const DeviceFrameView& from, const DeviceFrameView& to, double scaleX, double scaleY,
                           Vellum::RenderQuality quality) {
-    return kScale.Launch(from.device, ShapeFor(to.width, to.height), to.format, to.data,
+    return kScale.Launch(from.device, TileShapeFor(to.width, to.height), to.format, to.data,
                          PitchOf(to.rowBytes, to.format), to.width, to.height, from.format, from.data,
                          PitchOf(from.rowBytes, from.format), from.width, from.height, static_cast<float>(1.0 / scaleX),
                          static_cast<float>(1.0 / scaleY), FilterFor(quality),

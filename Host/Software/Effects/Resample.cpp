@@ -20,6 +20,10 @@ double CatmullRom(double t) {
 struct Taps {
     int first = 0;
     std::vector<double> weights;
+    std::vector<double> distances;  // in units of the filter
+
+    /// Is it short of the cubic's end, by more than rounding?
+    [[nodiscard]] bool IsWithin(std::size_t tap) const { return std::abs(distances[tap]) < 1.99; }
 };
 
 Taps MakeTaps(double place, double footprint, bool cubic) {
@@ -32,6 +36,7 @@ Taps MakeTaps(double place, double footprint, bool cubic) {
     for (int i = taps.first; i <= last; ++i) {
         const double t = (i + 0.5 - place) / stretch;
         taps.weights.push_back(cubic ? CatmullRom(t) : Tent(t));
+        taps.distances.push_back(t);
         sum += taps.weights.back();
     }
     for (double& weight : taps.weights) weight /= sum;
@@ -64,7 +69,7 @@ Pixel Sample(const Picture& picture, double u, double v, double footprintU, doub
             const double weight = across.weights[i] * down.weights[j] * pixel[3];
             for (std::size_t c = 0; c < 3; ++c) {
                 sum[c] += weight * pixel[c];
-                if (weight == 0.0) continue;
+                if (pixel[3] == 0.0 || !across.IsWithin(i) || !down.IsWithin(j)) continue;
                 least[c] = std::min(least[c], pixel[c]);
                 most[c] = std::max(most[c], pixel[c]);
             }
