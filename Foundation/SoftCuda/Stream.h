@@ -31,7 +31,8 @@ struct StreamPoint {
 /// them: a small copy that has nothing to do with them (a record for a later launch) goes first, and a stamp gets its
 /// share of the time that the launches take together.
 ///
-/// May be called from any thread. Its lock is taken alone; work runs without it.
+/// May be called from any thread. Under its lock only that of the memory is taken; work runs without it, but for small
+/// copies.
 class Stream {
 public:
     using Clock = std::chrono::steady_clock;
