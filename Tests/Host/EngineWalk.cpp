@@ -12,20 +12,29 @@
 namespace Vantrel::Host::Test {
 namespace {
 
-const CorvaneVideoSegmentSuite& Suite() {
+template <class Table>
+const Table& Acquire(const char* name, std::int32_t version) {
     const void* suite = nullptr;
-    EXPECT_EQ(HostServices::Instance().GetBasicSuite()->AcquireSuite(kVideoSegmentSuiteName, kVideoSegmentSuiteVersion,
-                                                                     &suite),
-              0);
-    return *static_cast<const CorvaneVideoSegmentSuite*>(suite);
+    EXPECT_EQ(HostServices::Instance().GetBasicSuite()->AcquireSuite(name, version, &suite), 0);
+    return *static_cast<const Table*>(suite);
+}
+
+const CorvaneVideoSegmentSuite& Suite() {
+    static const auto& kSuite = Acquire<CorvaneVideoSegmentSuite>(kVideoSegmentSuiteName, kVideoSegmentSuiteVersion);
+    return kSuite;
+}
+
+const LarkspurMemoryManagerSuite& Memory() {
+    static const auto& kSuite =
+        Acquire<LarkspurMemoryManagerSuite>(kMemoryManagerSuiteName, kMemoryManagerSuiteVersion);
+    return kSuite;
 }
 
 std::optional<std::string> Property(std::uint32_t node, const char* key) {
     char* text = nullptr;
     if (Suite().GetProperty(node, key, &text) != 0) return std::nullopt;
     const std::string copy = text;
-    const void* memory = HostServices::Instance().FindSuite(kMemoryManagerSuiteName, kMemoryManagerSuiteVersion);
-    static_cast<const LarkspurMemoryManagerSuite*>(memory)->FreeText(text);
+    Memory().FreeText(text);
     return copy;
 }
 
