@@ -72,6 +72,17 @@ TEST_F(NestedSequence, ItsRangeFollowsOffsetAndSpeed) {
     EXPECT_EQ(trees[1].end, 900);
 }
 
+TEST_F(NestedSequence, TheMediasOwnTimeOffsetCounts) {
+    AddNode(30, "Disabled");
+    host.nodes[30].inputs = {{10, 30}};
+    host.sequences[kTop].segments.clear();
+    AddSegment(kTop, 100, 300, 30, 50);
+    Read();
+    const auto& trees = Probe(Probe(InfoAt(100).tree).inputs[0]).segmentTrees;
+    ASSERT_EQ(trees.size(), 1U) << "the inner 20..220";
+    EXPECT_EQ(trees[0].start, 80);
+}
+
 TEST_F(NestedSequence, WithoutANodeForItThePiecesGoIntoTheMaps) {
     refused.insert("NestedTimelineNode");
     unregistered.insert("NestedTimelineNode");

@@ -103,6 +103,12 @@ TEST_F(TimelineUpdate, AnotherOffsetOrLengthReplacesTheRecordButNotTheTree) {
     EXPECT_EQ(InfoAt(0).offset, 20);
     EXPECT_EQ(InfoAt(79).out, 80);
     EXPECT_EQ(Describe(InfoAt(80).tree), "BlackVideoSource");
+
+    host.sequences[kTop].segments[0].offset = 30;
+    Change();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_EQ(InfoAt(0).tree, tree);
+    EXPECT_EQ(InfoAt(0).offset, 30);
 }
 
 TEST_F(TimelineUpdate, TheSameContentTwiceIsBuiltOnceAndTraced) {
