@@ -65,11 +65,16 @@ bool FilterNode::IsStill() const {
 
 VideoFrameRef FilterNode::FindCachedFrame(const Guid& hash, const RenderResultsRef& results) const {
     if (hash.IsNil()) return {};
-    if (VideoFrameRef stored = results->FindFrame(hash)) {
-        // A frame that was rendered further in place carries another fingerprint by now.
-        if (Ostrand::Demand<Marl::IFrameIdentity>(stored)->GetHash() == hash) return stored;
-    }
-    return mDevice->GetDeviceMemory()->GetFrameCache().FindFrame(hash);
+    const auto hashOf = [](const VideoFrameRef& frame) {
+        return Ostrand::Demand<Marl::IFrameIdentity>(frame)->GetHash();
+    };
+    // A frame that was rendered further in place, or placed anew, carries another fingerprint by now.
+    VideoFrameRef stored = results->FindFrame(hash);
+    if (stored && hashOf(stored) == hash) return stored;
+    VideoFrameRef cached = mDevice->GetDeviceMemory()->GetFrameCache().FindFrame(hash);
+    const Guid cachedHash = cached ? hashOf(cached) : Guid();
+    if (!cachedHash.IsNil() && cachedHash != hash) cached.Reset();
+    return cached;
 }
 
 Status FilterNode::RenderFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,

@@ -7,7 +7,7 @@
 
 namespace Vantrel {
 
-/// Turns a stream's alpha round: 1 - a, in place. Colour stays.
+/// Turns a stream's alpha round: 1 - a, in place but for stills, whose frames are kept. Colour stays.
 class InvertAlphaSource final : public SourceBaseNode<FilterNode>, public Ostrand::Allocated<InvertAlphaSource> {
 public:
     InvertAlphaSource() : SourceBaseNode(false, false) {}
