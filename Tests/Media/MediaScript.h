@@ -40,11 +40,9 @@ public:
              {"MediaNode::StreamFrameRate", std::to_string(kFrameTicks)}});
         host.nodes[kMotion].kind = "Effect";
         host.nodes[kMotion].properties["EffectNode::FilterMatchName"] = "TQ.XQVE Motion";
-        host.nodes[kMotion].params = {{0, FakePoint{0.5, 0.5}}, {1, 100.0F}, {2, 100.0F},
-                                      {3, std::uint8_t{1}},     {4, 0.0F},   {5, FakePoint{0.5, 0.5}}};
         host.nodes[kOpacity].kind = "Effect";
         host.nodes[kOpacity].properties["EffectNode::FilterMatchName"] = "TQ.XQVE Opacity";
-        host.nodes[kOpacity].params = {{0, 100.0F}, {1, std::int32_t{18}}};
+        ResetEffects();
         // A file delivers its own size, whatever is wanted.
         host.clips[kClipID].deliver = [stream](VantrelClipRecord wanted) {
             wanted.width = stream.Width();
@@ -58,6 +56,12 @@ public:
         params.sequenceID = kSequence;
     }
 
+    /// Motion and opacity that change nothing.
+    void ResetEffects() {
+        host.nodes[kMotion].params = {{0, FakePoint{0.5, 0.5}}, {1, 100.0F}, {2, 100.0F},
+                                      {3, std::uint8_t{1}},     {4, 0.0F},   {5, FakePoint{0.5, 0.5}}};
+        host.nodes[kOpacity].params = {{0, 100.0F}, {1, std::int32_t{18}}};
+    }
     /// Properties of the media.
     void Set(const Properties& properties) {
         for (const auto& [key, value] : properties) host.nodes[kMedia].properties[key] = value;
