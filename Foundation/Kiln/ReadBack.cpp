@@ -10,7 +10,7 @@ namespace {
 
 constexpr Kernel<DeviceBuffer, std::int32_t, Vellum::PixelFormat, DeviceBuffer, std::int32_t, std::int32_t,
                  std::int32_t, bool>
-    kPackBytes{"..\\..\\Kiln\\Modules\\ReadBack", "PackBytesKernel"};
+    kPackBytes{R"(..\..\Kiln\Modules\ReadBack)", "PackBytesKernel"};
 
 Status ReadRows(const FrameAttributes& to, std::uint8_t* target, const DeviceFrameView& from) {
     const std::uint64_t widthBytes = static_cast<std::uint64_t>(to.width) * Vellum::BytesPerPixel(to.format);

@@ -51,6 +51,7 @@ namespace Kiln::Cuda {
 
 /// The driver's entries, bound by name. The library is never unloaded: drivers keep threads of their own.
 struct Driver {
+// The argument is a name to declare, which parentheses would spoil. NOLINTNEXTLINE(bugprone-macro-parentheses)
 #define KILN_DECLARE_ENTRY(name, symbol) decltype(&::name) name = nullptr;
     KILN_CUDA_ENTRIES(KILN_DECLARE_ENTRY)
 #undef KILN_DECLARE_ENTRY

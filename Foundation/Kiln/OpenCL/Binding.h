@@ -53,6 +53,7 @@ namespace Kiln::OpenCL {
 
 /// The loader's entries, bound by name. The library is never unloaded: platforms keep threads of their own.
 struct Driver {
+// The argument is a name to declare, which parentheses would spoil. NOLINTNEXTLINE(bugprone-macro-parentheses)
 #define KILN_DECLARE_ENTRY(name) decltype(&::name) name = nullptr;
     KILN_OPENCL_ENTRIES(KILN_DECLARE_ENTRY)
 #undef KILN_DECLARE_ENTRY
