@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "Host/Snapshot/Node.h"
+#include "Host/Software/FilterGraph.h"
 #include "Host/Software/LayerPicture.h"
 
 namespace Vantrel::Host::Software {
@@ -35,6 +36,10 @@ using EffectFunction = void (*)(const EffectContext& context, LayerPicture& laye
 /// The software version of an effect; null if it has none.
 [[nodiscard]] EffectFunction FindEffectFunction(const std::string& matchName);
 
+/// An effect's graph with each {name} replaced by that parameter's value at a time: a number, a colour as 0xRRGGBBAA;
+/// of a point {name.x} and {name.y}. Throws std::runtime_error for a name that the effect hasn't.
+[[nodiscard]] std::string FillInParameters(const EffectDetail& effect, std::int64_t time);
+
 /// Runs effects on layers. May be used from several threads at once.
 class EffectRunner {
 public:
@@ -49,6 +54,7 @@ public:
 
 private:
     const bool mStrict;
+    FilterGraphs mGraphs;
     mutable std::mutex mMutex;
     std::set<std::string> mPassedThrough;
 };

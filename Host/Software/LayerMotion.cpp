@@ -6,20 +6,11 @@
 
 #include "Host/Software/Effects/Motion.h"
 #include "Host/Timeline/EffectTables.h"
+#include "Vantrel/Effects/Intrinsics.h"
 
 namespace Vantrel::Host::Software {
 
 namespace {
-
-enum OpacityParameter : std::int32_t { kOpacity_Percent = 0, kOpacity_BlendMode = 1 };
-enum MotionParameter : std::int32_t {
-    kMotion_Position = 0,
-    kMotion_Scale = 1,
-    kMotion_ScaleWidth = 2,
-    kMotion_Uniform = 3,
-    kMotion_Rotation = 4,
-    kMotion_Anchor = 5
-};
 
 /// Single precision carries fractions of a percent: what lies closer to a value than this counts as it.
 constexpr float kTolerance = 8e-6F;
@@ -37,7 +28,7 @@ const Node* FindOperator(const Node& clip, const char* matchName, std::size_t en
 }
 
 void ReadOpacity(const Node& opacity, std::int64_t time, LayerMotion& motion) {
-    motion.opacity = static_cast<float>(Evaluate(opacity, kOpacity_Percent, time, {100})[0]) / 100.0F;
+    motion.opacity = static_cast<float>(Evaluate(opacity, kOpacity_Opacity, time, {100})[0]) / 100.0F;
     motion.blendMode = static_cast<std::int32_t>(Evaluate(opacity, kOpacity_BlendMode, time, {Kiln::kBlend_Normal})[0]);
     if (!motion.overDestination && motion.blendMode != Kiln::kBlend_Normal) {
         motion.opacity = 1.0F;
@@ -53,7 +44,7 @@ void ReadPlace(const Node& place, std::int64_t time, LayerMotion& motion) {
     motion.anchorX = anchor[0];
     motion.anchorY = anchor[1];
     motion.scaleY = static_cast<float>(Evaluate(place, kMotion_Scale, time, {100})[0]) / 100.0F;
-    motion.scaleX = Evaluate(place, kMotion_Uniform, time, {1})[0] != 0
+    motion.scaleX = Evaluate(place, kMotion_UniformScale, time, {1})[0] != 0
                         ? motion.scaleY
                         : static_cast<float>(Evaluate(place, kMotion_ScaleWidth, time, {100})[0]) / 100.0F;
     motion.rotation = static_cast<float>(Evaluate(place, kMotion_Rotation, time, {0})[0]);

@@ -3,13 +3,16 @@
 #include "Host/Software/MediaLayers.h"
 
 #include <algorithm>
-#include <cstring>
+#include <cstdlib>
 #include <utility>
+#include <vector>
 
 #include "Host/Snapshot/Fingerprint.h"
 #include "Host/Software/Effects/Convert.h"
+#include "Host/Software/Effects/Dissolves.h"
 #include "Host/Software/Effects/FrameRepairs.h"
 #include "Host/Software/Effects/Resample.h"
+#include "Marl/TimeSampling.h"
 
 namespace Vantrel::Host::Software {
 
@@ -50,10 +53,32 @@ Picture ScaledTo(Picture picture, Size size, Vellum::RenderQuality quality) {
     return scaled;
 }
 
-/// The frame at whose beginning or in whose first half a time lies, or the next one.
-std::int64_t NearestFrameTime(std::int64_t time, std::int64_t frameTicks) {
-    const std::int64_t into = (time % frameTicks + frameTicks) % frameTicks;
-    return time - into + (2 * into > frameTicks ? frameTicks : 0);
+/// The instants whose frames show what happens from a media time on, with their shares: the nearest frame, or where
+/// frames are to be blended, all that one frame of the sequence covers. Fields aren't told apart.
+std::vector<Marl::TimeSample> SampleTimes(const Node& media, std::int64_t mediaTime, const View& view) {
+    const MediaDetail& detail = *media.AsMedia();
+    const Vellum::FrameRate rate = Vellum::FrameRate::Create(detail.clip->info.ticksPerFrame);
+    const bool blend = detail.frameBlend && view.quality >= 2;
+    const std::string* speed = media.FindProperty("MediaNode::ClipSpeed");
+    const Marl::TimeSpan span = Marl::CalculateDurationInMediaTime(
+        mediaTime, Vellum::FrameRate::Create(view.frameTicks), speed ? std::strtod(speed->c_str(), nullptr) : 1.0);
+    std::vector<Marl::TimeSample> samples;
+    if (!detail.samplesTime) {
+        samples.push_back({mediaTime, mediaTime, 0, 1.0});
+        return samples;
+    }
+    if (blend && !Marl::IsDegenerate(span, rate)) {
+        Marl::GetWeightedSamplesForRange(span, rate, rate, 0, samples);
+        Marl::NormalizeSampleWeights(samples);
+        return samples;
+    }
+    std::int64_t before = 0;
+    std::int64_t after = 0;
+    Marl::GetSamplesAroundTime(mediaTime, rate, blend, before, after);
+    const double share = Marl::CalculateSampleWeight(mediaTime, before, after);
+    if (share > 0.0) samples.push_back({before, before, 0, share});
+    if (share < 1.0) samples.push_back({after, after, 0, 1.0 - share});
+    return samples;
 }
 
 }  // namespace
@@ -67,11 +92,7 @@ Picture MediaLayers::ReadFrame(const MediaDetail& detail, std::int64_t frame) {
     const bool premultiplied =
         detail.alpha == AlphaChoice::kPremultiplied ||
         (detail.alpha == AlphaChoice::kAsMedia && detail.clip->info.alphaType == AlphaType::kPremultiplied);
-    if (premultiplied) {
-        const std::uint32_t matte = detail.clip->info.alphaMatteColor;
-        // Unpremultiply takes blue in the lowest byte, as the media's colour has it.
-        Unpremultiply(picture, matte);
-    }
+    if (premultiplied) Unpremultiply(picture, detail.clip->info.alphaMatteColor);
     if (detail.alpha == AlphaChoice::kInvert) {
         for (std::size_t i = 3; i < picture.pixels.size(); i += 4) picture.pixels[i] = 1.0F - picture.pixels[i];
     }
@@ -83,13 +104,10 @@ Picture MediaLayers::ReadFrame(const MediaDetail& detail, std::int64_t frame) {
     return picture;
 }
 
-Picture MediaLayers::RenderInstant(const Node& media, std::int64_t mediaTime) {
-    const MediaDetail& detail = *media.AsMedia();
-    const MediaInfo& info = detail.clip->info;
-    const std::int64_t time = detail.samplesTime ? NearestFrameTime(mediaTime, info.ticksPerFrame) : mediaTime;
+Picture MediaLayers::RenderExact(const MediaDetail& detail, std::int64_t mediaTime) {
     const auto* nested = std::get_if<NestedSource>(&detail.clip->source);
-    if (nested && detail.clip->id == 0) return mRenderSequence(*nested->sequence, time);
-    return ReadFrame(detail, MediaFrameAt(info, time));
+    if (nested && detail.clip->id == 0) return mRenderSequence(*nested->sequence, mediaTime);
+    return ReadFrame(detail, MediaFrameAt(detail.clip->info, mediaTime));
 }
 
 LayerPicture MediaLayers::Render(const Node& media, std::int64_t mediaTime, const View& view) {
@@ -97,7 +115,13 @@ LayerPicture MediaLayers::Render(const Node& media, std::int64_t mediaTime, cons
     const MediaInfo& info = detail.clip->info;
     const Size size = LayerSize(info, detail.scale, view);
     LayerPicture layer;
-    layer.picture = ScaledTo(RenderInstant(media, mediaTime), size, view.Quality());
+    std::vector<Picture> pictures;
+    std::vector<double> weights;
+    for (const Marl::TimeSample& sample : SampleTimes(media, mediaTime, view)) {
+        pictures.push_back(ScaledTo(RenderExact(detail, sample.time), size, view.Quality()));
+        weights.push_back(sample.weight);
+    }
+    layer.picture = pictures.size() == 1 ? std::move(pictures.front()) : WeightedSum(pictures, weights);
     layer.aspect = AspectOf(info);
     layer.origin = {(size.width - Rounded(view.sequenceWidth / view.ScaleX())) / 2,
                     (size.height - Rounded(view.sequenceHeight / view.ScaleY())) / 2};

@@ -23,7 +23,7 @@ public:
     [[nodiscard]] LayerPicture Render(const Node& media, std::int64_t mediaTime, const View& view);
 
 private:
-    [[nodiscard]] Picture RenderInstant(const Node& media, std::int64_t mediaTime);
+    [[nodiscard]] Picture RenderExact(const MediaDetail& detail, std::int64_t mediaTime);
     [[nodiscard]] Picture ReadFrame(const MediaDetail& detail, std::int64_t frame);
 
     MediaPictures& mPictures;

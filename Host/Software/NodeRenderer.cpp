@@ -6,7 +6,7 @@
 #include <stdexcept>
 #include <utility>
 
-#include "Host/Software/Effects/BlendModes.h"
+#include "Host/Software/Effects/Dissolves.h"
 #include "Host/Software/Effects/FrameRepairs.h"
 #include "Host/Software/MulticamGrid.h"
 #include "Host/Software/Transitions.h"
@@ -26,29 +26,6 @@ LayerPicture AsLayer(Picture picture, const View& view) {
     layer.picture = std::move(picture);
     layer.aspect = view.aspect;
     return layer;
-}
-
-/// An adjusted picture over the one that it was made of: where it lies it takes that one's place, as far as its opacity
-/// goes, so that opaque adjustments leave nothing of the picture below.
-void LayAdjusted(const Picture& adjusted, const Picture& coverage, const LayerMotion& motion, Picture& picture) {
-    for (int y = 0; y < picture.height; ++y) {
-        for (int x = 0; x < picture.width; ++x) {
-            const double share = std::clamp(coverage.At(x, y)[3] * motion.opacity, 0.0F, 1.0F);
-            if (share == 0.0) continue;
-            const Pixel below = picture.Get(x, y);
-            const Pixel above = adjusted.Get(x, y);
-            const Pixel blended = BlendColor(motion.blendMode, below, above);
-            const double weightBelow = (1.0 - share) * below[3];
-            const double weightAbove = share * above[3];
-            Pixel out{};
-            out[3] = weightBelow + weightAbove;
-            for (std::size_t c = 0; c < 3 && out[3] > 0; ++c) {
-                const double color = (1.0 - below[3]) * above[c] + below[3] * blended[c];
-                out[c] = (weightBelow * below[c] + weightAbove * color) / out[3];
-            }
-            picture.Set(x, y, out);
-        }
-    }
 }
 
 }  // namespace
@@ -155,7 +132,7 @@ Picture NodeRenderer::Adjust(const Node& adjustment, std::int64_t time, const Vi
     Picture picture = RenderInput(adjustment.inputs.at(0), time, view);
     const NodeInput& input = adjustment.inputs.at(1);
     const std::int64_t layerTime = time - input.offset;
-    LayerMotion motion = ReadLayerMotion(*input.node, layerTime, true);
+    const LayerMotion motion = ReadLayerMotion(*input.node, layerTime, true);
     const Picture adjusted = PlaceLayer(RenderLayer(*input.node, layerTime, view), LayerMotion{}, view).picture;
     // The layer's own shape goes where the layer goes; its pixels stay where they were.
     Picture whole(view.width, view.height);
@@ -164,7 +141,8 @@ Picture NodeRenderer::Adjust(const Node& adjustment, std::int64_t time, const Vi
     place.opacity = 1.0F;
     place.blendMode = Kiln::kBlend_Normal;
     place.overDestination = false;
-    LayAdjusted(adjusted, PlaceLayer(AsLayer(std::move(whole), view), place, view).picture, motion, picture);
+    const Picture matte = PlaceLayer(AsLayer(std::move(whole), view), place, view).picture;
+    LayAdjusted(adjusted, matte, static_cast<double>(motion.opacity), motion.blendMode, picture);
     return picture;
 }
 

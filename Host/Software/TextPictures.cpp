@@ -47,7 +47,7 @@ std::size_t CountFitting(const TextPainter& painter, const std::string& text, do
     return low;
 }
 
-/// Breaks at blanks, and where a word is too long, anywhere.
+/// Breaks at blanks, else after a slash, and where a word is too long, anywhere.
 std::vector<std::string> Wrap(const TextPainter& painter, std::string text, double width, std::size_t limit) {
     std::vector<std::string> lines;
     while (!text.empty() && lines.size() < limit) {
@@ -57,7 +57,12 @@ std::vector<std::string> Wrap(const TextPainter& painter, std::string text, doub
         }
         std::size_t count = CountFitting(painter, text, width);
         const std::size_t blank = text.rfind(' ', count);
-        if (blank != std::string::npos && blank > 0) count = blank;
+        const std::size_t slash = text.rfind('/', count - 1);
+        if (blank != std::string::npos && blank > 0) {
+            count = blank;
+        } else if (slash != std::string::npos && slash > 0) {
+            count = slash + 1;
+        }
         lines.push_back(text.substr(0, count));
         text.erase(0, text[count] == ' ' ? count + 1 : count);
     }

@@ -3,38 +3,16 @@
 #include "Host/Software/Transitions.h"
 
 #include <algorithm>
-#include <cmath>
 #include <cstdlib>
 #include <cstring>
+#include <utility>
 
+#include "Host/Software/Effects/Dissolves.h"
 #include "Host/Software/Effects/FrameRepairs.h"
 
 namespace Vantrel::Host::Software {
 
 namespace {
-
-constexpr double kFilmGamma = 2.2;
-
-double Power(double value, double exponent) { return std::copysign(std::pow(std::fabs(value), exponent), value); }
-
-Picture AddPictures(const Picture& first, const Picture& second, double fraction) {
-    const double firstShare = std::min(1.0, 2.0 * (1.0 - fraction));
-    const double secondShare = std::min(1.0, 2.0 * fraction);
-    Picture sum(first.width, first.height);
-    for (int y = 0; y < sum.height; ++y) {
-        for (int x = 0; x < sum.width; ++x) {
-            const Pixel a = first.Get(x, y);
-            const Pixel b = second.Get(x, y);
-            const double weightA = firstShare * a[3];
-            const double weightB = secondShare * b[3];
-            Pixel out{};
-            out[3] = std::min(1.0, weightA + weightB);
-            for (std::size_t c = 0; c < 3 && out[3] > 0; ++c) out[c] = (weightA * a[c] + weightB * b[c]) / out[3];
-            sum.Set(x, y, out);
-        }
-    }
-    return sum;
-}
 
 struct Rectangle {
     int left, top, right, bottom;
@@ -136,33 +114,10 @@ Picture RenderDip(float elapsed, double level, const TransitionSides& sides) {
     const Picture picture = second ? sides.incoming() : sides.outgoing();
     Picture color(picture.width, picture.height);
     Fill(color, 0, 0, color.width, color.height, {level, level, level, 1.0});
-    return second ? MixPictures(color, picture, fraction, false) : MixPictures(picture, color, fraction, false);
+    return second ? CrossDissolve(color, picture, fraction, false) : CrossDissolve(picture, color, fraction, false);
 }
 
 }  // namespace
-
-Picture MixPictures(const Picture& first, const Picture& second, double fraction, bool film) {
-    if (fraction == 0.0) return first;
-    if (fraction == 1.0) return second;
-    Picture mixed(first.width, first.height);
-    for (int y = 0; y < mixed.height; ++y) {
-        for (int x = 0; x < mixed.width; ++x) {
-            const Pixel a = first.Get(x, y);
-            const Pixel b = second.Get(x, y);
-            const double weightA = (1.0 - fraction) * a[3];
-            const double weightB = fraction * b[3];
-            Pixel out{};
-            out[3] = weightA + weightB;
-            for (std::size_t c = 0; c < 3 && out[3] > 0; ++c) {
-                out[c] = film ? Power((weightA * Power(a[c], kFilmGamma) + weightB * Power(b[c], kFilmGamma)) / out[3],
-                                      1.0 / kFilmGamma)
-                              : (weightA * a[c] + weightB * b[c]) / out[3];
-            }
-            mixed.Set(x, y, out);
-        }
-    }
-    return mixed;
-}
 
 Picture RenderTransition(const Node& transition, float elapsed, const TransitionSides& sides, bool& known) {
     const std::string& name = transition.AsTransition()->matchName;
@@ -172,10 +127,10 @@ Picture RenderTransition(const Node& transition, float elapsed, const Transition
     if (name == "XQVE Dip To White") return RenderDip(elapsed, 1.0, sides);
     const Picture outgoing = sides.outgoing();
     const Picture incoming = sides.incoming();
-    if (name == "XQVE Additive Dissolve") return AddPictures(outgoing, incoming, elapsed);
+    if (name == "XQVE Additive Dissolve") return AdditiveDissolve(outgoing, incoming, elapsed);
     const bool film = name == "XQVE Film Dissolve";
     known = film || name == "XQVE Cross Dissolve";
-    return MixPictures(outgoing, incoming, elapsed, film);
+    return CrossDissolve(outgoing, incoming, elapsed, film);
 }
 
 }  // namespace Vantrel::Host::Software

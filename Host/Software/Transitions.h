@@ -17,15 +17,10 @@ struct TransitionSides {
 
 /// The picture at `elapsed`, 0 at the transition's beginning and 1 at its end.
 ///
-/// "XQVE Cross Dissolve" mixes the values as they are, "XQVE Film Dissolve" the light that they stand for; colour is
-/// weighed by alpha in both. "XQVE Additive Dissolve" adds: the outgoing picture stays whole up to the middle and the
-/// incoming one is whole from there on. The dips go through black or white. "XQVE Push" moves pictures by whole pixels.
+/// For "XQVE Cross Dissolve", "XQVE Film Dissolve" and "XQVE Additive Dissolve" see Effects/Dissolves.h. The dips are
+/// dissolves to black or white and from there on. "XQVE Push" moves pictures by whole pixels.
 /// @param known  becomes false for a name that isn't known, which shows as a cross dissolve
 [[nodiscard]] Picture RenderTransition(const Node& transition, float elapsed, const TransitionSides& sides,
                                        bool& known);
-
-/// The mix of two pictures of the same size: the first at fraction 0, the second at 1.
-/// @param film  mixes light, taken as value to the power of 2.2, rather than values
-[[nodiscard]] Picture MixPictures(const Picture& first, const Picture& second, double fraction, bool film);
 
 }  // namespace Vantrel::Host::Software

@@ -1,0 +1,37 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <cstdint>
+#include <vector>
+
+#include "Host/Software/Picture.h"
+
+/// Mixes of pictures of the same size. Colour is weighed by alpha in all of them.
+namespace Vantrel::Host::Software {
+
+/// The first picture at fraction 0, the second at 1, to the bit; in between
+///
+///     a = (1 - f) a1 + f a2,   c = ((1 - f) a1 c1 + f a2 c2) / a
+///
+/// @param film  mixes the light that values stand for, value to the power of 2.2 (negative ones mirrored), as a film
+/// that
+///              is exposed twice does
+[[nodiscard]] Picture CrossDissolve(const Picture& first, const Picture& second, double fraction, bool film);
+
+/// Adds: the outgoing picture stays whole up to the middle and then fades, the incoming one is whole from the middle
+/// on. With the shares p = min(1, 2 (1 - f)) and q = min(1, 2 f): a = min(1, p a1 + q a2), c = (p a1 c1 + q a2 c2) / a.
+[[nodiscard]] Picture AdditiveDissolve(const Picture& outgoing, const Picture& incoming, double fraction);
+
+/// The sum of pictures by weights. At least one picture.
+[[nodiscard]] Picture WeightedSum(const std::vector<Picture>& pictures, const std::vector<double>& weights);
+
+/// Lays a picture that was made of another one over it: where `matte` covers, it takes the other's place, so that at
+/// full coverage nothing of that remains. With k = matte's alpha times opacity, taken between 0 and 1, and B the blend
+/// mode's colour of `picture` (b) and `adjusted` (s):
+///
+///     a = (1 - k) ab + k as,   c = ((1 - k) ab cb + k as ((1 - ab) cs + ab B(cb, cs))) / a
+void LayAdjusted(const Picture& adjusted, const Picture& matte, double opacity, std::int32_t blendMode,
+                 Picture& picture);
+
+}  // namespace Vantrel::Host::Software
