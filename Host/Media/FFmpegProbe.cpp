@@ -57,7 +57,9 @@ MediaInfo Describe(const VideoFile& file) {
     info.still = info.still || info.ticksPerFrame == 0;
     info.frameCount = info.still ? 1 : stream.frameCount;
     if (stream.interlaced) info.fieldType = stream.upperFieldFirst ? FieldType::kTopFirst : FieldType::kBottomFirst;
-    info.alphaType = stream.hasAlpha ? AlphaType::kStraight : AlphaType::kNone;
+    // OpenEXR has colour multiplied by alpha; every other form that keeps alpha has it straight.
+    const AlphaType form = stream.codecName == "exr" ? AlphaType::kPremultiplied : AlphaType::kStraight;
+    info.alphaType = stream.hasAlpha ? form : AlphaType::kNone;
     info.codecTag = stream.codecTag;
     info.startTimecode = ReadTimecode(stream, info.ticksPerFrame);
     info.bitDepth = stream.bitDepth;

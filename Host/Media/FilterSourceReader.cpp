@@ -20,7 +20,8 @@ bool LeavesOpen(const AVFilter& filter, const std::string& text, const char* opt
 
 }  // namespace
 
-FilterSourceReader::FilterSourceReader(const std::string& source, std::int32_t width, std::int32_t height, AVRational rate)
+FilterSourceReader::FilterSourceReader(const std::string& source, std::int32_t width, std::int32_t height,
+                                       AVRational rate)
     : mSource(source), mWidth(width), mHeight(height), mRate(rate) {
     Start();
 }

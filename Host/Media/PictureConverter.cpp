@@ -4,6 +4,8 @@
 
 #include <cstring>
 
+#include "Host/Media/DeepPicture.h"
+
 extern "C" {
 #include <libavutil/pixdesc.h>
 }
@@ -31,6 +33,21 @@ int MatrixOf(const AVFrame& frame) {
     }
 }
 
+LumaWeights WeightsOf(const AVFrame& frame) {
+    switch (MatrixOf(frame)) {
+        case SWS_CS_ITU709:
+            return {0.2126, 0.0722};
+        case SWS_CS_FCC:
+            return {0.30, 0.11};
+        case SWS_CS_SMPTE240M:
+            return {0.212, 0.087};
+        case SWS_CS_BT2020:
+            return {0.2627, 0.0593};
+        default:
+            return {0.299, 0.114};
+    }
+}
+
 bool IsFullRange(const AVFrame& frame) {
     if (frame.color_range != AVCOL_RANGE_UNSPECIFIED) return frame.color_range == AVCOL_RANGE_JPEG;
     switch (frame.format) {
@@ -42,7 +59,8 @@ bool IsFullRange(const AVFrame& frame) {
             return true;
         default: {
             const AVPixFmtDescriptor* format = av_pix_fmt_desc_get(static_cast<AVPixelFormat>(frame.format));
-            return format && (format->flags & AV_PIX_FMT_FLAG_RGB) != 0;
+            // Grey comes from pictures, which know no video levels.
+            return format && ((format->flags & AV_PIX_FMT_FLAG_RGB) != 0 || format->nb_components < 3);
         }
     }
 }
@@ -140,7 +158,8 @@ std::shared_ptr<HostPicture> PictureConverter::ConvertDeep(const AVFrame& frame)
 std::shared_ptr<HostPicture> PictureConverter::Convert(const AVFrame& frame, int rotation) {
     std::shared_ptr<HostPicture> picture;
     if (IsDeepFormat(frame.format)) {
-        picture = ConvertDeep(frame);
+        picture = MakeHostPicture(*mPool, Vellum::kPixelFormat_BGRA_4444_32f, frame.width, frame.height);
+        if (!ConvertDeepPicture(frame, WeightsOf(frame), IsFullRange(frame), *picture)) picture = ConvertDeep(frame);
     } else {
         Prepare(frame, AV_PIX_FMT_BGRA);
         picture = MakeHostPicture(*mPool, Vellum::kPixelFormat_BGRA_4444_8u, frame.width, frame.height);

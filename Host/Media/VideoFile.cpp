@@ -16,6 +16,8 @@ namespace {
 
 /// Running on is cheaper than a seek up to about the length of a group of pictures.
 constexpr std::int64_t kRunForwardFrames = 48;
+/// Files up to this size are read through where nothing else tells their length.
+constexpr std::int64_t kScannedBytes = std::int64_t{128} << 20;
 
 std::uint32_t SwapCodecTag(std::uint32_t tag) {
     return tag << 24 | (tag & 0xFF00U) << 8 | (tag >> 8 & 0xFF00U) | tag >> 24;
@@ -108,31 +110,45 @@ void VideoFile::ReadInfo() {
         mInfo.frameCount = 1;
         return;
     }
+    CountFrames();
+}
+
+void VideoFile::CountFrames() {
     const AVRational average = mStream->avg_frame_rate;
     // Containers round time stamps, so that the average rate of a constant stream strays a little.
     const bool varies = average.num > 0 && std::abs(av_q2d(average) / av_q2d(mInfo.frameRate) - 1.0) > 0.01;
-    if (varies) {
-        ScanVariableRate();
-    } else if (mStream->nb_frames > 0) {
+    if (!varies && mStream->nb_frames > 0) {
         mInfo.frameCount = mStream->nb_frames;
-    } else {
-        const double seconds = mStream->duration > 0
-                                   ? static_cast<double>(mStream->duration) * av_q2d(mStream->time_base)
-                                   : static_cast<double>(mInput->duration) / AV_TIME_BASE;
-        mInfo.frameCount = std::max<std::int64_t>(1, std::llround(seconds * av_q2d(mInfo.frameRate)));
+        mCountIsExact = true;
+        return;
     }
+    const double seconds = mStream->duration > 0 ? static_cast<double>(mStream->duration) * av_q2d(mStream->time_base)
+                                                 : static_cast<double>(mInput->duration) / AV_TIME_BASE;
+    mInfo.frameCount = std::max<std::int64_t>(1, std::llround(seconds * av_q2d(mInfo.frameRate)));
+    // Streams without an index tell their length by their last time stamps only, which is a few frames short.
+    const bool guessed = mInput->duration_estimation_method != AVFMT_DURATION_FROM_STREAM && mInput->pb &&
+                         avio_size(mInput->pb) <= kScannedBytes;
+    if (!varies && !guessed) return;
+    std::int64_t count = 0;
+    const bool timed = ScanPackets(count);
+    if (count > 0) {
+        mInfo.frameCount = count;
+        mCountIsExact = true;
+    }
+    if (!varies || !timed) mTimestamps.clear();
+    SeekBefore(0);
 }
 
-void VideoFile::ScanVariableRate() {
+bool VideoFile::ScanPackets(std::int64_t& count) {
     while (av_read_frame(mInput.get(), mPacket.get()) >= 0) {
-        if (mPacket->stream_index == mStream->index && mPacket->pts != AV_NOPTS_VALUE) {
-            mTimestamps.push_back(mPacket->pts);
+        if (mPacket->stream_index == mStream->index) {
+            ++count;
+            if (mPacket->pts != AV_NOPTS_VALUE) mTimestamps.push_back(mPacket->pts);
         }
         av_packet_unref(mPacket.get());
     }
     std::sort(mTimestamps.begin(), mTimestamps.end());
-    mInfo.frameCount = std::max<std::int64_t>(1, static_cast<std::int64_t>(mTimestamps.size()));
-    SeekBefore(0);
+    return static_cast<std::int64_t>(mTimestamps.size()) == count;
 }
 
 std::int64_t VideoFile::NumberOf(std::int64_t pts) const {
@@ -141,6 +157,16 @@ std::int64_t VideoFile::NumberOf(std::int64_t pts) const {
         return std::lower_bound(mTimestamps.begin(), mTimestamps.end(), pts) - mTimestamps.begin();
     }
     return av_rescale_q_rnd(pts - mFirstTimestamp, mStream->time_base, av_inv_q(mInfo.frameRate), AV_ROUND_NEAR_INF);
+}
+
+std::int64_t VideoFile::NumberOfDecoded() {
+    // Some containers tell when packets are decoded, not when frames are shown: a frame then comes out when the packet
+    // goes in that lies the decoder's delay later. Their key frames have no time of their own.
+    if (!mLast && mDecoded->key_frame != 0 && mDecoded->pts == AV_NOPTS_VALUE) mHasDecodingTimes = true;
+    const std::int64_t pts = mDecoded->best_effort_timestamp;
+    if (pts == AV_NOPTS_VALUE) return mLastNumber + 1;
+    const int delay = mHasDecodingTimes && mTimestamps.empty() ? mDecoder->has_b_frames : 0;
+    return std::max<std::int64_t>(0, NumberOf(pts) - delay);
 }
 
 std::int64_t VideoFile::TimestampOf(std::int64_t number) const {
@@ -191,8 +217,7 @@ bool VideoFile::DecodeNext() {
             mAtEnd = true;
             break;
         }
-        const std::int64_t pts = mDecoded->best_effort_timestamp;
-        const std::int64_t number = pts == AV_NOPTS_VALUE ? mLastNumber + 1 : NumberOf(pts);
+        const std::int64_t number = NumberOfDecoded();
         mLast = ShareFrame(*mDecoded);
         av_frame_unref(mDecoded.get());
         mLastNumber = number;
@@ -204,7 +229,8 @@ bool VideoFile::DecodeNext() {
 }
 
 Frame VideoFile::ReadFrame(std::int64_t number) {
-    number = std::clamp<std::int64_t>(number, 0, mInfo.frameCount - 1);
+    number = std::max<std::int64_t>(number, 0);
+    if (mCountIsExact || mInfo.still) number = std::min(number, mInfo.frameCount - 1);
     for (const auto& [recentNumber, frame] : mRecent) {
         if (recentNumber == number) return ShareFrame(*frame);
     }
@@ -233,6 +259,7 @@ Frame VideoFile::ReadFrame(std::int64_t number) {
     }
     if (before) {
         mInfo.frameCount = beforeNumber + 1;
+        mCountIsExact = true;
         return before;
     }
     if (mLast) return ShareFrame(*mLast);

@@ -54,12 +54,15 @@ public:
 private:
     void OpenStream(int threads);
     void ReadInfo();
-    void ScanVariableRate();
+    /// Reads all packets; true if each of them tells its time.
+    bool ScanPackets(std::int64_t& count);
+    void CountFrames();
     void SeekBefore(std::int64_t number);
     /// Decodes the next frame in order; false at the end.
     bool DecodeNext();
     void FeedDecoder();
     [[nodiscard]] std::int64_t NumberOf(std::int64_t pts) const;
+    [[nodiscard]] std::int64_t NumberOfDecoded();
     [[nodiscard]] std::int64_t TimestampOf(std::int64_t number) const;
     [[noreturn]] void Fail(const std::string& what, int code) const;
 
@@ -69,6 +72,8 @@ private:
     AVStream* mStream = nullptr;  ///< owned by mInput
     VideoStreamInfo mInfo;
     std::int64_t mFirstTimestamp = 0;
+    bool mCountIsExact = false;
+    bool mHasDecodingTimes = false;
     std::vector<std::int64_t> mTimestamps;  ///< sorted; only for a varying rate
     Packet mPacket = MakePacket();
     bool mDraining = false;

@@ -56,10 +56,13 @@ void ReadTransitionProperties(const JsonCursor& at, Item& item) {
     at.ExpectObject();
     at.WarnOfOthers({"border_width", "border_color", "direction", "reverse"});
     if (const auto color = at.Find("border_color")) {
+        // Red lies in the lowest byte.
         std::uint32_t packed = 0;
+        int shift = 0;
         for (const double component : color->Numbers(3)) {
             if (component < 0 || component > 255) color->Fail("a colour's components lie in 0 to 255");
-            packed = packed << 8 | static_cast<std::uint32_t>(component + 0.5);
+            packed |= static_cast<std::uint32_t>(component + 0.5) << shift;
+            shift += 8;
         }
         item.properties.emplace_back("TransitionNode::TransitionBorderColor", std::to_string(packed));
     }
