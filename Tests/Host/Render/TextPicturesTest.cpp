@@ -1,0 +1,181 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#include <gtest/gtest.h>
+
+#include <algorithm>
+#include <cstdlib>
+
+#include "Host/Software/Effects/ColorBars.h"
+#include "Host/Software/TextPainter.h"
+#include "Host/Software/TextPictures.h"
+#include "Tests/Support/Pictures.h"
+
+namespace Vantrel::Testing {
+namespace {
+
+using Host::Title;
+
+/// Set VANTREL_TEST_PICTURES to a folder to look at what these tests draw.
+void Keep(const Picture& picture, const char* name) {
+    if (const char* folder = std::getenv("VANTREL_TEST_PICTURES")) {
+        EXPECT_TRUE(WritePng(picture, std::string(folder) + "/" + name + ".png"));
+    }
+}
+
+struct Box {
+    int left = 1 << 20, top = 1 << 20, right = 0, bottom = 0;
+    double coverage = 0;
+};
+
+/// Where alpha isn't 0.
+Box Find(const Picture& picture) {
+    Box box;
+    for (int y = 0; y < picture.height; ++y) {
+        for (int x = 0; x < picture.width; ++x) {
+            if (picture.At(x, y)[3] <= 0.0F) continue;
+            box.left = std::min(box.left, x);
+            box.top = std::min(box.top, y);
+            box.right = std::max(box.right, x + 1);
+            box.bottom = std::max(box.bottom, y + 1);
+            box.coverage += static_cast<double>(picture.At(x, y)[3]);
+        }
+    }
+    return box;
+}
+
+Picture Draw(const Title& title, int width = 640, int height = 360, double aspect = 1.0) {
+    Picture picture(width, height);
+    DrawTitle(title, aspect, picture);
+    return picture;
+}
+
+TEST(Titles, StandAtTheirPlaceInTheirColour) {
+    Title title;
+    title.text = "HHH";
+    title.size = 60;
+    title.color = {1, 0.5, 0.25, 1};
+    const Picture centred = Draw(title);
+    Keep(centred, "title");
+    const Box box = Find(centred);
+    EXPECT_NEAR((box.left + box.right) / 2.0, 320, 2);
+    EXPECT_NEAR((box.top + box.bottom) / 2.0, 180, 8);
+    // A capital is about 0.7 of the em high.
+    EXPECT_NEAR(box.bottom - box.top, 60 * 0.69, 3);
+    const float* inside = centred.At(box.left + 5, (box.top + box.bottom) / 2);
+    EXPECT_FLOAT_EQ(inside[3], 1.0F);
+    EXPECT_FLOAT_EQ(inside[0], 0.25F);
+    EXPECT_FLOAT_EQ(inside[2], 1.0F);
+
+    title.position = {0.25, 0.75};
+    title.align = -1;
+    const Box left = Find(Draw(title));
+    EXPECT_NEAR(left.left, 160, 8);
+    title.align = 1;
+    const Box right = Find(Draw(title));
+    EXPECT_NEAR(right.right, 160, 8);
+    EXPECT_NEAR(right.top - box.top, 90, 1);
+}
+
+TEST(Titles, ScaleWithSizeLinesAndPixelAspect) {
+    Title title;
+    title.text = "Hgx\xC3\xA9";
+    const Box tenth = Find(Draw(title));
+    title.size = 36;
+    const Box same = Find(Draw(title));
+    EXPECT_EQ(tenth.left, same.left);
+    EXPECT_EQ(tenth.bottom, same.bottom);
+    title.size = 72;
+    const Box twice = Find(Draw(title));
+    EXPECT_NEAR(twice.right - twice.left, 2 * (same.right - same.left), 4);
+    EXPECT_NEAR(twice.coverage / same.coverage, 4.0, 0.1);
+
+    // Pixels twice as wide as high: half as many of them.
+    const Box wide = Find(Draw(title, 640, 360, 2.0));
+    EXPECT_NEAR(wide.right - wide.left, (twice.right - twice.left) / 2.0, 3);
+    EXPECT_EQ(wide.bottom - wide.top, twice.bottom - twice.top);
+
+    title.text = "H\nH";
+    const Box lines = Find(Draw(title));
+    EXPECT_NEAR((lines.top + lines.bottom) / 2.0, 180, 8);
+    EXPECT_NEAR(lines.bottom - lines.top, 72 * (1.15 + 0.69), 6);
+}
+
+TEST(Titles, FindTheirFonts) {
+    const auto endsWith = [](const std::string& path, const std::string& name) {
+        return path.size() > name.size() && path.compare(path.size() - name.size(), name.size(), name) == 0;
+    };
+    EXPECT_TRUE(endsWith(Host::Software::FindFontFile(""), "/LiberationSans-Regular.ttf"));
+    EXPECT_TRUE(endsWith(Host::Software::FindFontFile("Arial Bold"), "/LiberationSans-Bold.ttf"));
+    EXPECT_TRUE(endsWith(Host::Software::FindFontFile("Times New Roman"), "/LiberationSerif-Regular.ttf"));
+    EXPECT_TRUE(
+        endsWith(Host::Software::FindFontFile("Liberation Mono Bold Italic"), "/LiberationMono-BoldItalic.ttf"));
+    EXPECT_TRUE(endsWith(Host::Software::FindFontFile("sans-serif"), "/LiberationSans-Regular.ttf"));
+    EXPECT_TRUE(endsWith(Host::Software::FindFontFile("No Such Family"), "/LiberationSans-Regular.ttf"));
+}
+
+TEST(Titles, WhatLiesOutsideIsCutOff) {
+    Title title;
+    title.text = "Far too long for this small picture";
+    title.size = 80;
+    title.position = {0.0, 0.0};
+    EXPECT_GT(Find(Draw(title, 50, 30)).coverage, 0.0);
+    title.text = "";
+    EXPECT_EQ(Find(Draw(title, 50, 30)).coverage, 0.0);
+}
+
+TEST(Slate, ShowsNameAndReasonOnDark) {
+    Picture slate(640, 360);
+    Host::Software::DrawSlate("A001_C007_shot",
+                              "/media/a/very/long/path/that/needs/more/than/one/line/because/it/goes/on/"
+                              "and/on/A001_C007.mov can't be opened: No such file or directory",
+                              1.0, slate);
+    Keep(slate, "slate");
+    int bright = 0;
+    double sum = 0;
+    for (int y = 0; y < 360; ++y) {
+        for (int x = 0; x < 640; ++x) {
+            EXPECT_EQ(slate.At(x, y)[3], 1.0F);
+            sum += static_cast<double>(slate.At(x, y)[1]);
+            if (slate.At(x, y)[1] > 0.9F) ++bright;
+        }
+    }
+    EXPECT_GT(bright, 500);
+    EXPECT_LT(sum / (640 * 360), 0.2);
+    EXPECT_LT(slate.At(3, 3)[1], 0.15F);
+    Picture tiny(7, 5);
+    Host::Software::DrawSlate("name", "reason", 1.0, tiny);
+    Picture unnamed(64, 36);
+    Host::Software::DrawSlate("", "", 1.0, unnamed);
+}
+
+TEST(ColorBars, HaveTheirLevels) {
+    Picture bars(720, 480);
+    Host::Software::DrawColorBars(bars);
+    Keep(bars, "bars");
+    const auto expect = [&bars](int x, int y, double red, double green, double blue) {
+        EXPECT_NEAR(bars.At(x, y)[2], red, 1e-6) << x << "," << y;
+        EXPECT_NEAR(bars.At(x, y)[1], green, 1e-6) << x << "," << y;
+        EXPECT_NEAR(bars.At(x, y)[0], blue, 1e-6) << x << "," << y;
+        EXPECT_EQ(bars.At(x, y)[3], 1.0F);
+    };
+    const double level = 0.75;
+    const double colors[7][3] = {{level, level, level}, {level, level, 0}, {0, level, level}, {0, level, 0},
+                                 {level, 0, level},     {level, 0, 0},     {0, 0, level}};
+    for (int bar = 0; bar < 7; ++bar) {
+        const int middle = (2 * bar + 1) * 720 / 14;
+        expect(middle, 10, colors[bar][0], colors[bar][1], colors[bar][2]);
+        const double* reversed = colors[6 - bar];
+        if (bar % 2 == 0) {
+            expect(middle, 340, reversed[0], reversed[1], reversed[2]);
+        } else {
+            expect(middle, 340, 0, 0, 0);
+        }
+    }
+    expect(180, 470, 1, 1, 1);
+    expect(719, 479, 0, 0, 0);
+    EXPECT_LT(bars.At(530, 470)[1], 0.0F);
+    EXPECT_GT(bars.At(600, 470)[1], 0.0F);
+}
+
+}  // namespace
+}  // namespace Vantrel::Testing
