@@ -8,6 +8,7 @@
 #include "Src/Filters/Source/FieldReverseSource.h"
 #include "Src/Filters/Source/InterlaceConsecutiveFramesSource.h"
 #include "Src/Filters/Source/InvertAlphaSource.h"
+#include "Src/Filters/Source/RemoveFlickerSource.h"
 #include "Src/Filters/Source/ReverseFieldDominanceSource.h"
 #include "Src/Filters/Source/ScaleSource.h"
 #include "Src/Filters/Source/TimeSampleSource.h"
@@ -136,6 +137,7 @@ Status MediaNode::BuildChain(const ChainPlan& plan, const RenderRequirements& re
     add(plan.timeSample, &MediaNode::AddSource<TimeSampleSource>);
     add(true, &MediaNode::AddSource<ScaleSource>);
     add(plan.interlaceConsecutive, &MediaNode::AddSource<InterlaceConsecutiveFramesSource>);
+    add(plan.removeFlicker, &MediaNode::AddSource<RemoveFlickerSource>);
     add(plan.deinterlace, &MediaNode::AddSource<DeinterlaceSource>);
     add(plan.reverseDominance, &MediaNode::AddSource<ReverseFieldDominanceSource>);
     add(plan.fieldReverse, &MediaNode::AddSource<FieldReverseSource>);

@@ -65,6 +65,8 @@ TEST_F(MediaChain, HasOnlyTheSourcesThatTheMediaNeeds) {
     EXPECT_THAT(Chain({{"MediaNode::StreamInvertAlpha", "1"}}),
                 ElementsAre("ScaleSource", "InvertAlphaSource", "Upload Node"));
     EXPECT_THAT(Chain({{"MediaNode::StreamIgnoreAlpha", "1"}}), ElementsAre("ScaleSource", "Upload Node"));
+    EXPECT_THAT(Chain({{"MediaNode::RemoveFlicker", "1"}}),
+                ElementsAre("ScaleSource", "RemoveFlickerSource", "Upload Node"));
 }
 
 TEST_F(MediaChain, BringsFieldsIntoTheSequencesOrder) {

@@ -282,6 +282,22 @@ TEST_P(UploadDevice, SourcesChangeThePicture) {
     EXPECT_NEAR(picture.Get(0, 0)[3], 0.8, 1e-3) << "alpha turns round";
 }
 
+TEST_P(UploadDevice, FlickerIsSpreadOverTheLinesAround) {
+    // One opaque white line on a clear ground that is blue where nobody sees it, and another at the lower edge.
+    Show(Paint(64, 36, [](int, int y) -> std::array<std::uint8_t, 4> {
+        if (y == 10 || y == 35) return {255, 255, 255, 255};
+        return {255, 0, 0, 0};
+    }));
+    script.Set({{"MediaNode::RemoveFlicker", "1"}, {"MediaNode::StreamFieldType", "1"}});
+    script.params.fieldSelection = 0;
+    const VideoFrameRef frame = Play(*MakeMedia<ClipMedia>());
+    ExpectPixel(frame, {1.0, 1.0, 1.0, 0.5}, 63, 10);
+    ExpectPixel(frame, {1.0, 1.0, 1.0, 0.25}, 1, 9);
+    ExpectPixel(frame, {1.0, 1.0, 1.0, 0.25}, 1, 11);
+    ExpectPixel(frame, {0.0, 0.0, 0.0, 0.0}, 1, 12);
+    ExpectPixel(frame, {1.0, 1.0, 1.0, 0.75}, 1, 35);
+}
+
 TEST_P(UploadDevice, BlendedFramesWeighColorByAlpha) {
     script.Set({{"MediaNode::StreamFrameBlend", "1"}, {"MediaNode::StreamFrameRate", "250"}});
     script.params.quality = 2;
