@@ -5,6 +5,7 @@
 
 #include <cmath>
 
+#include "Tests/Host/Render/KeepPicture.h"
 #include "Tests/Host/Render/Stage.h"
 
 namespace Vantrel::Testing {
@@ -428,6 +429,30 @@ TEST(Structure, TitlesBarsAndSlatesAppearInTheirPlace) {
     Stage source(Timeline({Track({Clip("test", Range(0, 10), GeneratorOf("testsrc2"))})}, Format(64, 48)));
     EXPECT_FALSE(PicturesAgree(source.Render(0), source.Render(5), kExactly));
     EXPECT_TRUE(PicturesAgree(source.Render(3), source.Render(3), kExactly));
+}
+
+TEST(Structure, AWholeFrameGoesTogether) {
+    const Json source =
+        Clip("source", Range(0, 10), GeneratorOf("testsrc2"),
+             Effects({Effect("lavfi:hue=h=90"), Opacity(80), Move({{"1", 50}, {"4", 20}, {"0", {0.35, 0.4}}})}));
+    const Json light = Solid(255, 160, 40, 10, Effects({Opacity(100, 22), Move({{"1", 40}, {"0", {0.75, 0.35}}})}));
+    const Json title = Clip("title", Range(0, 10),
+                            GeneratorOf("title", {{"text", "Over\neverything"},
+                                                  {"size", 36},
+                                                  {"position", {0.5, 0.75}},
+                                                  {"font", "Liberation Serif Bold"}}));
+    Stage stage(Timeline({Track({Clip("bars", Range(0, 10), GeneratorOf("SMPTEBars"))}), Track({source}),
+                          Track({light}), Track({title})},
+                         Format(480, 270)));
+    const Picture picture = stage.Render(4);
+    KeepPicture(picture, "composite");
+    EXPECT_TRUE(stage.GetRenderer().GetPassedThrough().empty());
+    // Screen over the bars' third stripe from the right: 1 - (1 - b)(1 - s).
+    ExpectPixel(picture, 310, 100, {1, 160.0 / 255, 0.75 + 0.25 * 40.0 / 255, 1}, 1e-4);
+    ExpectPixel(picture, 476, 10, {0, 0, 0.75, 1}, 1e-4);
+    // The turned source lies within the frame: its corner's surroundings are the bars' own.
+    ExpectPixel(picture, 10, 10, {0.75, 0.75, 0.75, 1}, 1e-4);
+    for (std::size_t i = 3; i < picture.pixels.size(); i += 4) ASSERT_EQ(picture.pixels[i], 1.0F);
 }
 
 }  // namespace

@@ -3,24 +3,16 @@
 #include <gtest/gtest.h>
 
 #include <algorithm>
-#include <cstdlib>
 
 #include "Host/Software/Effects/ColorBars.h"
 #include "Host/Software/TextPainter.h"
 #include "Host/Software/TextPictures.h"
-#include "Tests/Support/Pictures.h"
+#include "Tests/Host/Render/KeepPicture.h"
 
 namespace Vantrel::Testing {
 namespace {
 
 using Host::Title;
-
-/// Set VANTREL_TEST_PICTURES to a folder to look at what these tests draw.
-void Keep(const Picture& picture, const char* name) {
-    if (const char* folder = std::getenv("VANTREL_TEST_PICTURES")) {
-        EXPECT_TRUE(WritePng(picture, std::string(folder) + "/" + name + ".png"));
-    }
-}
 
 struct Box {
     int left = 1 << 20, top = 1 << 20, right = 0, bottom = 0;
@@ -55,7 +47,7 @@ TEST(Titles, StandAtTheirPlaceInTheirColour) {
     title.size = 60;
     title.color = {1, 0.5, 0.25, 1};
     const Picture centred = Draw(title);
-    Keep(centred, "title");
+    KeepPicture(centred, "title");
     const Box box = Find(centred);
     EXPECT_NEAR((box.left + box.right) / 2.0, 320, 2);
     EXPECT_NEAR((box.top + box.bottom) / 2.0, 180, 8);
@@ -129,7 +121,7 @@ TEST(Slate, ShowsNameAndReasonOnDark) {
                               "/media/a/very/long/path/that/needs/more/than/one/line/because/it/goes/on/"
                               "and/on/A001_C007.mov can't be opened: No such file or directory",
                               1.0, slate);
-    Keep(slate, "slate");
+    KeepPicture(slate, "slate");
     int bright = 0;
     double sum = 0;
     for (int y = 0; y < 360; ++y) {
@@ -151,7 +143,7 @@ TEST(Slate, ShowsNameAndReasonOnDark) {
 TEST(ColorBars, HaveTheirLevels) {
     Picture bars(720, 480);
     Host::Software::DrawColorBars(bars);
-    Keep(bars, "bars");
+    KeepPicture(bars, "bars");
     const auto expect = [&bars](int x, int y, double red, double green, double blue) {
         EXPECT_NEAR(bars.At(x, y)[2], red, 1e-6) << x << "," << y;
         EXPECT_NEAR(bars.At(x, y)[1], green, 1e-6) << x << "," << y;
