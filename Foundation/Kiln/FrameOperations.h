@@ -40,8 +40,11 @@ Ostrand::Status FillWithOpaqueWhite(const DeviceRef& device, DeviceBuffer buffer
                                     Vellum::PixelFormat format, std::int32_t left, std::int32_t top, std::int32_t width,
                                     std::int32_t height);
 
-/// Resamples all of the source onto all of the target. `scaleX` and `scaleY` are target size over source size; they may
-/// differ from the quotient of the whole sizes by the fraction that rounding to pixels took away.
+/// Resamples all of the source onto all of the target, upper left corners together. `scaleX` and `scaleY` are target
+/// size over source size, positive; they may differ from the quotient of the whole sizes by the fraction that rounding
+/// to pixels took away. Beyond its border the source's pixels go on. Colour is weighed by alpha. The filter by quality:
+/// the nearest pixel; bilinear; Catmull-Rom's cubic. The last two are widened where they reduce, so that every source
+/// pixel counts.
 Ostrand::Status Scale(const DeviceRef& device, DeviceBuffer source, std::int32_t sourceRowBytes,
                       std::int32_t sourceWidth, std::int32_t sourceHeight, DeviceBuffer target,
                       std::int32_t targetRowBytes, std::int32_t targetWidth, std::int32_t targetHeight,

@@ -2,8 +2,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-/// Laying pixels over others, for kernels in lanes. Docs/blend-modes.md has every formula and its source; here `b` is the
-/// backdrop's channel and `s` the source's.
+/// Laying pixels over others, for kernels in lanes. Docs/blend-modes.md has every formula and its source; here `b` is
+/// the backdrop's channel and `s` the source's.
 
 #define BLEND_COLOR 0
 #define BLEND_COLOR_BURN 1
@@ -38,9 +38,7 @@ DEVICE_FUNCTION float BlendHardLight(float b, float s) {
     return s <= 0.5f ? 2.0f * b * s : b + t - b * t;
 }
 
-DEVICE_FUNCTION float BlendPinLight(float b, float s) {
-    return s <= 0.5f ? Min(b, 2.0f * s) : Max(b, 2.0f * s - 1.0f);
-}
+DEVICE_FUNCTION float BlendPinLight(float b, float s) { return s <= 0.5f ? Min(b, 2.0f * s) : Max(b, 2.0f * s - 1.0f); }
 
 /// min(1, b / d), 1 where d is 0, and 0 where b is: the quotient that dodge, burn and divide are made of.
 DEVICE_FUNCTION float BlendQuotient(float b, float d) {
@@ -70,7 +68,8 @@ DEVICE_FUNCTION float Luminosity(Float4 c) { return 0.11f * c.x + 0.59f * c.y + 
 DEVICE_FUNCTION float LeastOf(Float4 c) { return Min(Min(c.x, c.y), c.z); }
 DEVICE_FUNCTION float MostOf(Float4 c) { return Max(Max(c.x, c.y), c.z); }
 
-/// SetLum: shifts a colour to a luminosity, and pulls it towards that grey as far as it takes to bring it into the gamut.
+/// SetLum: shifts a colour to a luminosity, and pulls it towards that grey as far as it takes to bring it into the
+/// gamut.
 DEVICE_FUNCTION Float4 SetLuminosity(Float4 c, float luminosity) {
     const float shift = luminosity - Luminosity(c);
     const float least = LeastOf(c) + shift, most = MostOf(c) + shift;
@@ -103,10 +102,10 @@ DEVICE_FUNCTION float SaturationOf(Float4 c) { return MostOf(c) - LeastOf(c); }
         BLEND_CHANNEL(z, formula)       \
         return;                         \
     }
-#define BLEND_BOUNDED_CHANNEL(plane, formula)                                             \
-    EACH_LANE(i) {                                                                        \
-        const float b = Saturate(below->plane[i]), s = Saturate(layer->plane[i]);         \
-        out->plane[i] = (formula);                                                        \
+#define BLEND_BOUNDED_CHANNEL(plane, formula)                                     \
+    EACH_LANE(i) {                                                                \
+        const float b = Saturate(below->plane[i]), s = Saturate(layer->plane[i]); \
+        out->plane[i] = (formula);                                                \
     }
 #define BLEND_BOUNDED_CHANNELS(number, formula) \
     if (mode == number) {                       \
@@ -115,22 +114,22 @@ DEVICE_FUNCTION float SaturationOf(Float4 c) { return MostOf(c) - LeastOf(c); }
         BLEND_BOUNDED_CHANNEL(z, formula)       \
         return;                                 \
     }
-#define BLEND_COLORS(number, formula)                                    \
-    if (mode == number) {                                                \
-        EACH_LANE(i) {                                                   \
-            const Float4 b = Clamp4(GetLane(below, i), 0.0f, 1.0f);      \
-            const Float4 s = Clamp4(GetLane(layer, i), 0.0f, 1.0f);      \
-            SetLane(out, i, formula);                                    \
-        }                                                                \
-        return;                                                          \
+#define BLEND_COLORS(number, formula)                               \
+    if (mode == number) {                                           \
+        EACH_LANE(i) {                                              \
+            const Float4 b = Clamp4(GetLane(below, i), 0.0f, 1.0f); \
+            const Float4 s = Clamp4(GetLane(layer, i), 0.0f, 1.0f); \
+            SetLane(out, i, formula);                               \
+        }                                                           \
+        return;                                                     \
     }
-#define BLEND_WHOLE_COLORS(number, condition)                            \
-    if (mode == number) {                                                \
-        EACH_LANE(i) {                                                   \
-            const Float4 b = GetLane(below, i), s = GetLane(layer, i);   \
-            SetLane(out, i, Select4(condition, s, b));                   \
-        }                                                                \
-        return;                                                          \
+#define BLEND_WHOLE_COLORS(number, condition)                          \
+    if (mode == number) {                                              \
+        EACH_LANE(i) {                                                 \
+            const Float4 b = GetLane(below, i), s = GetLane(layer, i); \
+            SetLane(out, i, Select4(condition, s, b));                 \
+        }                                                              \
+        return;                                                        \
     }
 
 /// B(b, s): `out` receives colours, its alpha is undefined.
@@ -194,7 +193,8 @@ DEVICE_FUNCTION void BlendOverLanes(Lanes4* layer, const Lanes4* below, const fl
         const float ab = Saturate(below->w[i]);
         const float alpha = as + ab * (1.0f - as);
         const float share = as / alpha;
-        // Selected rather than mixed where one side has no part: what isn't seen mustn't leave a trace, not even of NaN.
+        // Selected rather than mixed where one side has no part: what isn't seen mustn't leave a trace, not even of
+        // NaN.
         const int all = share >= 1.0f, none = !(as > 0.0f);
         const float x4 = Mix(below->x[i], layer->x[i], share), y4 = Mix(below->y[i], layer->y[i], share);
         const float z4 = Mix(below->z[i], layer->z[i], share);

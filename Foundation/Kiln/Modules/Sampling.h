@@ -2,9 +2,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-/// Reading a picture between its pixels, for kernels in lanes. Positions are in pixels from the picture's upper left corner,
-/// pixel centres at halves; beyond the border the border's pixels go on. Sums are premultiplied: their colour is weighed by
-/// alpha, and StraightenLanes divides it out again.
+/// Reading a picture between its pixels, for kernels in lanes. Positions are in pixels from the picture's upper left
+/// corner, pixel centres at halves; beyond the border the border's pixels go on. Sums are premultiplied: their colour
+/// is weighed by alpha, and StraightenLanes divides it out again.
 
 #define FILTER_NEAREST 0
 #define FILTER_BILINEAR 1
@@ -50,7 +50,8 @@ DEVICE_FUNCTION float FilterWeight(int filter, float distance) {
 /// The first pixel that the filter reaches from a position.
 DEVICE_FUNCTION int FirstTap(Reach reach, float position) { return (int)Ceil(position - reach.radius - 0.5f); }
 
-DEVICE_FUNCTION void SampleNearest(Lanes4* sum, AnyFrame in, int format, Region region, const float* u, const float* v) {
+DEVICE_FUNCTION void SampleNearest(Lanes4* sum, AnyFrame in, int format, Region region, const float* u,
+                                   const float* v) {
     int index[LANES];
     EACH_LANE(i) {
         const int column = ClampInt((int)Floor(u[i]), 0, region.width - 1);
@@ -61,8 +62,8 @@ DEVICE_FUNCTION void SampleNearest(Lanes4* sum, AnyFrame in, int format, Region 
 }
 
 /// The filtered picture at LANES positions, tap by tap.
-DEVICE_FUNCTION void SampleTaps(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across, Reach down,
-                                const float* u, const float* v) {
+DEVICE_FUNCTION void SampleTaps(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across,
+                                Reach down, const float* u, const float* v) {
     float total[LANES];
     ClearLanes(sum);
     EACH_LANE(i) total[i] = 0.0f;
@@ -104,8 +105,9 @@ DEVICE_FUNCTION void SampleTaps(Lanes4* sum, AnyFrame in, int format, Region reg
     }
 }
 
-/// Divides the colour of a sum by its alpha. An alpha that is 1 but for rounding becomes 1, one that the cubic's negative
-/// weights brought out of 0..1 comes back into it, and where no more than rounding is left the pixel is transparent black.
+/// Divides the colour of a sum by its alpha. An alpha that is 1 but for rounding becomes 1, one that the cubic's
+/// negative weights brought out of 0..1 comes back into it, and where no more than rounding is left the pixel is
+/// transparent black.
 DEVICE_FUNCTION void StraightenLanes(Lanes4* sum) {
     EACH_LANE(i) {
         const float alpha = sum->w[i];
@@ -120,9 +122,9 @@ DEVICE_FUNCTION void StraightenLanes(Lanes4* sum) {
     }
 }
 
-/// A cubic's negative weights can cancel nearly all of an alpha and leave colour over, which the division then blows up.
-/// Where less than a quarter of alpha carries a colour beyond -2..2, the colour is brought back between those of the taps
-/// that are seen. That is rare: all others pay for the question alone.
+/// A cubic's negative weights can cancel nearly all of an alpha and leave colour over, which the division then blows
+/// up. Where less than a quarter of alpha carries a colour beyond -2..2, the colour is brought back between those of
+/// the taps that are seen. That is rare: all others pay for the question alone.
 DEVICE_FUNCTION void RestrainLanes(Lanes4* pixels, AnyFrame in, int format, Region region, Reach across, Reach down,
                                    const float* u, const float* v) {
     int wild[LANES];
@@ -141,7 +143,8 @@ DEVICE_FUNCTION void RestrainLanes(Lanes4* pixels, AnyFrame in, int format, Regi
     for (int tap = 0; tap < across.taps * down.taps; ++tap) {
         int index[LANES], counts[LANES];
         EACH_LANE(i) {
-            const int column = FirstTap(across, u[i]) + tap % across.taps, row = FirstTap(down, v[i]) + tap / across.taps;
+            const int column = FirstTap(across, u[i]) + tap % across.taps,
+                      row = FirstTap(down, v[i]) + tap / across.taps;
             const float fromColumn = Abs((float)column + 0.5f - u[i]) * across.inverse;
             const float fromRow = Abs((float)row + 0.5f - v[i]) * down.inverse;
             index[i] = (region.top + ClampInt(row, 0, region.height - 1)) * region.pitch + region.left +

@@ -2,9 +2,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-/// The CPU's way to filter: a filter's taps lie side by side in memory, so two pixels are taken with one load, and no lane
-/// waits for a gather. Where the picture isn't turned, a tile of it is premultiplied once for several lines, and the sums
-/// down its columns are shared by all lanes. See Sampling.h for what the functions do.
+/// The CPU's way to filter: a filter's taps lie side by side in memory, so two pixels are taken with one load, and no
+/// lane waits for a gather. Where the picture isn't turned, a tile of it is premultiplied once for several lines, and
+/// the sums down its columns are shared by all lanes. See Sampling.h for what the functions do.
 
 typedef float Vector8 __attribute__((vector_size(32)));
 typedef int Index8 __attribute__((vector_size(32)));
@@ -52,8 +52,8 @@ DEVICE_FUNCTION Vector4 AddHalves(Vector8 pair) {
 DEVICE_FUNCTION Vector8 LoadWeighedPair(const uchar* address, int format) {
     Vector8 pair;
     if (format == 0)
-        pair = __builtin_shufflevector(SoftCuda::LoadHalf4(address), SoftCuda::LoadHalf4(address + 8), 0, 1, 2, 3, 4, 5, 6,
-                                       7);
+        pair = __builtin_shufflevector(SoftCuda::LoadHalf4(address), SoftCuda::LoadHalf4(address + 8), 0, 1, 2, 3, 4, 5,
+                                       6, 7);
     else
         __builtin_memcpy(&pair, address, sizeof pair);
     const Vector8 ones = {1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f};
@@ -102,8 +102,8 @@ DEVICE_FUNCTION int TapsLieInside(const LaneTaps* taps, int count, int size) {
     return MinInt(a, b) >= 0 && MaxInt(a, b) + count <= size;
 }
 
-DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter,
-                                    Reach across, Reach down, const float* u, const float* v) {
+DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across,
+                                    Reach down, const float* u, const float* v) {
     const int columns = (across.taps + 1) & ~1;
     LaneTaps tapsAcross, tapsDown;
     if (columns <= MOST_TAPS && down.taps <= MOST_TAPS) {
@@ -153,7 +153,8 @@ DEVICE_FUNCTION void BeginTile(Tile* tile, AnyFrame in, int format, Region regio
     const int top = FirstTap(down, Min(firstV, lastV)), bottom = FirstTap(down, Max(firstV, lastV)) + down.taps;
     const int columns = (high - low + 1) & ~1;
     tile->pairs = 0;
-    if (taps > MOST_TAPS || down.taps > MOST_TAPS || columns > MOST_TILE_COLUMNS || low >= region.width || high <= 0) return;
+    if (taps > MOST_TAPS || down.taps > MOST_TAPS || columns > MOST_TILE_COLUMNS || low >= region.width || high <= 0)
+        return;
     if (columns * (bottom - top) > MOST_TILE_PIXELS) return;
     tile->low = low;
     tile->columns = columns;
