@@ -55,11 +55,18 @@ Ostrand::Status Scale(const DeviceRef& device, DeviceBuffer source, std::int32_t
 /// The layer's anchor (fractions of the source) comes to lie on the position (fractions of the target). Around it the
 /// layer is scaled (factors; the source's pixel aspect over the target's is applied besides) and then turned clockwise
 /// by `rotation` degrees in square-pixel space. Pixels outside the source are transparent; edges are exact to a
-/// fraction of a pixel by coverage; colour is weighed by alpha.
-/// @param opacity          0.0 to 1.0, multiplies the layer's alpha.
-/// @param blendMode        an IR_BlendMode; unknown numbers draw as kBlend_Normal.
-/// @param overDestination  false: the layer replaces the target where its box lies, and the rest of the target stays;
-///                         true: it is blended over the target.
+/// fraction of a pixel by coverage; colour is weighed by alpha. Filters are those of Scale. A layer whose pixels fall
+/// onto the target's (moved by whole pixels, turned by right angles, flipped) is drawn without a filter, to the bit;
+/// within 1/512 pixel of that counts, since fractions of a frame in single precision come no closer.
+///
+/// A scale of 0, or a place outside the target, draws nothing and is no failure; a number that isn't finite is one.
+/// @param sourceAspectNumerator,targetAspectNumerator pixel aspects; one that isn't positive counts as square.
+/// @param opacity          0.0 to 1.0, clamped; multiplies the layer's alpha.
+/// @param blendMode        an IR_BlendMode; unknown numbers draw as kBlend_Normal. Docs/blend-modes.md has the
+/// formulas.
+/// @param overDestination  false: the layer replaces the target where its box lies, mixed by coverage at its edges; the
+///                         rest of the target stays, and the blend mode has no part in it. true: it is blended over
+///                         the target, which stays to the bit where the layer is transparent.
 Ostrand::Status Motion(const DeviceRef& device, DeviceBuffer source, std::int32_t sourceRowBytes,
                        std::int32_t sourceLeft, std::int32_t sourceTop, std::int32_t sourceWidth,
                        std::int32_t sourceHeight, std::int32_t sourceAspectNumerator,

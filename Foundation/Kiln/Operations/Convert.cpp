@@ -10,7 +10,7 @@ namespace {
 using Vellum::PixelFormat;
 namespace Bits = Vellum::PixelFormatBits;
 
-constexpr const char* kModule = "..\\..\\Kiln\\Modules\\Convert";
+constexpr const char* kModule = R"(..\..\Kiln\Modules\Convert)";
 
 /// As Modules/Convert.kernel has them.
 enum class Alpha : std::int32_t { kStraight = 0, kPremultiplied = 1, kOpaque = 2 };

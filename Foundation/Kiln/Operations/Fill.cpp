@@ -7,7 +7,7 @@ namespace {
 
 using Vellum::PixelFormat;
 
-constexpr const char* kModule = "..\\..\\Kiln\\Modules\\Fill";
+constexpr const char* kModule = R"(..\..\Kiln\Modules\Fill)";
 
 constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, float4> kFill{kModule,
                                                                                                     "FillKernel"};

@@ -8,7 +8,7 @@ namespace {
 
 using Vellum::PixelFormat;
 
-constexpr const char* kModule = "..\\..\\Kiln\\Modules\\FrameRepairs";
+constexpr const char* kModule = R"(..\..\Kiln\Modules\FrameRepairs)";
 
 constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, float4> kUnpremultiply{
     kModule, "UnpremultiplyKernel"};

@@ -11,7 +11,7 @@ namespace {
 
 using Vellum::PixelFormat;
 
-constexpr const char* kModule = "..\\..\\Kiln\\Modules\\Motion";
+constexpr const char* kModule = R"(..\..\Kiln\Modules\Motion)";
 
 constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t,
                  DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t, float, float,

@@ -12,10 +12,10 @@ using Vellum::PixelFormat;
 
 constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, PixelFormat, DeviceBuffer,
                  std::int32_t, std::int32_t, std::int32_t, float, float, Filter, bool>
-    kScale{"..\\..\\Kiln\\Modules\\Scale", "ScaleKernel"};
+    kScale{R"(..\..\Kiln\Modules\Scale)", "ScaleKernel"};
 constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, PixelFormat, DeviceBuffer,
                  std::int32_t, std::int32_t>
-    kConvertFloats{"..\\..\\Kiln\\Modules\\Convert", "ConvertFloatsKernel"};
+    kConvertFloats{R"(..\..\Kiln\Modules\Convert)", "ConvertFloatsKernel"};
 
 bool IsOpaque(PixelFormat format) { return format == kPixelFormat_GPU_BGRX_4444_16f; }
 
