@@ -27,7 +27,7 @@ struct Taps {
 };
 
 Taps MakeTaps(double place, double footprint, bool cubic) {
-    const double stretch = std::max(1.0, footprint);
+    const double stretch = std::max(1.0, cubic ? footprint : footprint - 0.5);
     const double radius = (cubic ? 2.0 : 1.0) * stretch;
     Taps taps;
     taps.first = static_cast<int>(std::ceil(place - radius - 0.5));

@@ -13,9 +13,10 @@ namespace Vantrel::Host::Software {
 ///
 /// Filters by quality: the nearest pixel as it is (kDraft, kLow); the tent (kMedium); the Catmull-Rom cubic (kHigh,
 /// kMaximum; Keys, "Cubic convolution interpolation for digital image processing", 1981, a = -1/2). The last two are
-/// stretched to the footprint where that is wider than a pixel, and normalised. The cubic's negative weights can cancel
-/// nearly all of an alpha and leave colour over: where less than a quarter of alpha carries a colour beyond -2..2, the
-/// colour is brought back between those of the pixels that took part.
+/// stretched where the footprint is wider than a pixel, the cubic by the footprint, the tent by half a pixel less (a
+/// slight reduction it bears as it is), and normalised. The cubic's negative weights can cancel nearly all of an alpha
+/// and leave colour over: where less than a quarter of alpha carries a colour beyond -2..2, the colour is brought back
+/// between those of the pixels that took part.
 /// @param footprintU,footprintV how much of the picture one pixel of the result covers in each direction, in pixels
 [[nodiscard]] Pixel Sample(const Picture& picture, double u, double v, double footprintU, double footprintV,
                            Vellum::RenderQuality quality);
