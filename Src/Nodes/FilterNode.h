@@ -65,6 +65,8 @@ protected:
         Purge(token, params, results);
         return attempt();
     }
+    /// The node with a node for motion and opacity before it, where it has none and isn't black; else the node itself.
+    [[nodiscard]] RenderNodeRef WrapInput(const RenderNodeRef& node);
     /// A mark on the device's queue when timing is on, else empty.
     [[nodiscard]] Kiln::TimingMarkRef MarkWhenTiming() const;
 
@@ -81,7 +83,6 @@ private:
     void KeepFrame(const Guid& hash, const RenderResultsRef& results, const VideoFrameRef& frame);
     [[nodiscard]] bool IsStill() const;
     void MakeRoom(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results);
-    [[nodiscard]] RenderNodeRef WrapInput(const RenderNodeRef& node);
 
     bool mSelfRendering;
     bool mWrapInputs;

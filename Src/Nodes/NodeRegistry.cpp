@@ -13,6 +13,7 @@
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/IntrinsicNode.h"
 #include "Src/Filters/MediaNode.h"
+#include "Src/Filters/NestedTimelineNode.h"
 #include "Src/Filters/SWHostRenderClipPrefetch.h"
 #include "Src/Filters/Synthetics/SolidColorNode.h"
 #include "Src/Filters/UploadNode.h"
@@ -46,6 +47,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"HostRenderSubtree", Make<ProxyNode<UploadNode, HostRenderSubtreeNode>>},
     {u"TQ.XQVE Opacity", Make<IntrinsicNode>},
     {u"TQ.XQVE Motion", Make<IntrinsicNode>},
+    {u"NestedTimelineNode", Make<NestedTimelineNode>},
     {u"DisabledNode", Make<DisabledNode>},
     {u"TQ.XQVE Invert", Make<InvertNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},

@@ -66,10 +66,10 @@ TEST_F(NestedSequence, ItsRangeFollowsOffsetAndSpeed) {
     EXPECT_TRUE(info.hostPart) << "a nested sequence at another speed needs the host";
     const auto& trees = Probe(info.tree).segmentTrees;
     ASSERT_EQ(trees.size(), 2U) << "200..600 is the inner 100..500";
-    EXPECT_EQ(trees[0].start, 100);
-    EXPECT_EQ(trees[0].end, 400);
-    EXPECT_EQ(trees[1].start, 400);
-    EXPECT_EQ(trees[1].end, 900);
+    EXPECT_EQ(trees[0].start, 0) << "in the inner sequence's own time, in which it is rendered";
+    EXPECT_EQ(trees[0].end, 300);
+    EXPECT_EQ(trees[1].start, 300);
+    EXPECT_EQ(trees[1].end, 800);
 }
 
 TEST_F(NestedSequence, TheMediasOwnTimeOffsetCounts) {
