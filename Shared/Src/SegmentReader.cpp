@@ -132,12 +132,13 @@ std::int64_t SegmentReader::AddSegments(const VideoSegmentsHandle& handle, const
             Segment segment;
             segment.index = index;
             segment.guid = entry.hash;
-            segment.start = entry.start + range.in - range.offset;
-            segment.end = entry.end + range.in - range.offset;
+            segment.start = entry.start;
+            segment.end = entry.end;
             segment.sourceStart = entry.offset;
-            segment.clipped.in = std::max(range.in, segment.start);
-            segment.clipped.out = std::min(range.out, segment.end);
-            segment.clipped.offset = entry.offset + segment.clipped.in - segment.start;
+            const std::int64_t mappedStart = entry.start + range.in - range.offset;
+            segment.clipped.in = std::max(range.in, mappedStart);
+            segment.clipped.out = std::min(range.out, entry.end + range.in - range.offset);
+            segment.clipped.offset = entry.offset + segment.clipped.in - mappedStart;
             if (reached < segment.clipped.in) {
                 AddGap(reached, segment.clipped.in, target.top);
                 reached = segment.clipped.in;

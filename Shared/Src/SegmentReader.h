@@ -38,7 +38,7 @@ private:
     struct Segment {
         std::int32_t index = 0;
         SequenceRange clipped;
-        std::int64_t start = 0;  ///< the whole entry in the caller's time
+        std::int64_t start = 0;  ///< the whole entry, in the sequence's own time
         std::int64_t end = 0;
         std::int64_t sourceStart = 0;  ///< the content's time at the whole entry's start
         Guid guid;
