@@ -34,30 +34,37 @@ std::int64_t FrameAt(std::int64_t time, std::int64_t frame) {
         std::floor((static_cast<long double>(time) + 254016.0L) / static_cast<long double>(frame)));
 }
 
+void ListFrames(const Sight& sight, std::vector<Shown>& frames) {
+    if (sight.kind == Sight::Kind::kFrame) frames.push_back(sight.frame);
+    for (const Sight& part : sight.parts) ListFrames(part, frames);
+}
+
 }  // namespace
 
 std::vector<Shown> DirectEvaluator::At(std::int64_t time) {
-    mShown.clear();
-    ShowStack(mDocument.tracks, time);
-    return mShown;
+    std::vector<Shown> frames;
+    ListFrames(SightAt(time), frames);
+    return frames;
 }
 
-void DirectEvaluator::ShowComposition(const Item& composition, std::int64_t time) {
-    composition.kind == ItemKind::kTrack ? ShowTrack(composition, time) : ShowStack(composition, time);
+Sight DirectEvaluator::ShowComposition(const Item& composition, std::int64_t time) {
+    return composition.kind == ItemKind::kTrack ? ShowTrack(composition, time) : ShowStack(composition, time);
 }
 
-void DirectEvaluator::ShowStack(const Item& stack, std::int64_t time) {
+Sight DirectEvaluator::ShowStack(const Item& stack, std::int64_t time) {
+    Sight sight;
     for (const Item& child : stack.children) {
         if (!child.enabled) continue;
         const std::int64_t length = ItemLength(child);
         const bool carried = child.speed != 1.0 || child.freeze;
         if (child.kind == ItemKind::kTrack && !carried) {
             if (child.sourceRange && (time < 0 || time >= length)) continue;
-            ShowTrack(child, time + (child.sourceRange ? child.sourceRange->start : 0));
+            sight.parts.push_back(ShowTrack(child, time + (child.sourceRange ? child.sourceRange->start : 0)));
         } else if (time >= 0 && time < length) {
-            ShowItem(child, length, time);
+            sight.parts.push_back(ShowItem(child, length, time));
         }
     }
+    return sight;
 }
 
 DirectEvaluator::Expanded DirectEvaluator::Expand(const Item& track) {
@@ -93,23 +100,31 @@ bool DirectEvaluator::Expanded::Shows(std::size_t part) const {
     return part < parts.size() && parts[part].item->kind != ItemKind::kGap && parts[part].item->enabled;
 }
 
-void DirectEvaluator::ShowTrack(const Item& track, std::int64_t time) {
-    if (time < 0) return;  // of a leading transition nothing is seen before the track begins
+Sight DirectEvaluator::ShowTrack(const Item& track, std::int64_t time) {
+    Sight sight;
+    if (time < 0) return sight;  // of a leading transition nothing is seen before the track begins
     const Expanded expanded = Expand(track);
+    const auto show = [&](std::size_t index) {
+        const Part& part = expanded.parts[index];
+        return ShowItem(*part.item, part.length, time - part.start);
+    };
     for (const Join& join : expanded.joins) {
-        if (time < join.cut - join.transition->inOffset || time >= join.cut + join.transition->outOffset) continue;
+        const std::int64_t from = join.cut - join.transition->inOffset;
+        const std::int64_t to = join.cut + join.transition->outOffset;
+        if (time < from || time >= to) continue;
+        sight.kind = Sight::Kind::kMix;
+        sight.fraction = static_cast<double>(time - from) / static_cast<double>(to - from);
         for (const std::size_t side : {join.before, join.after}) {
-            if (!expanded.Shows(side)) continue;
-            const Part& part = expanded.parts[side];
-            ShowItem(*part.item, part.length, time - part.start);
+            sight.parts.push_back(expanded.Shows(side) ? show(side) : Sight());
         }
-        return;
+        return sight;
     }
     for (std::size_t i = 0; i < expanded.parts.size(); ++i) {
         const Part& part = expanded.parts[i];
         if (!expanded.Shows(i) || time < part.start || time >= part.start + part.length) continue;
-        ShowItem(*part.item, part.length, time - part.start);
+        sight.parts.push_back(show(i));
     }
+    return sight;
 }
 
 std::int64_t DirectEvaluator::LengthOf(const Item& composition) {
@@ -123,7 +138,7 @@ std::int64_t DirectEvaluator::LengthOf(const Item& composition) {
     return longest;
 }
 
-void DirectEvaluator::ShowItem(const Item& item, std::int64_t length, std::int64_t itemTime) {
+Sight DirectEvaluator::ShowItem(const Item& item, std::int64_t length, std::int64_t itemTime) {
     const bool clip = item.kind == ItemKind::kClip;
     const std::int64_t mediaStart = clip && item.media.availableRange ? item.media.availableRange->start : 0;
     const std::int64_t first = item.sourceRange ? item.sourceRange->start : mediaStart;
@@ -131,17 +146,27 @@ void DirectEvaluator::ShowItem(const Item& item, std::int64_t length, std::int64
     if (item.speed < 0)
         moved = -static_cast<long double>(item.speed) * static_cast<long double>(length - mFrame - itemTime);
     if (item.freeze) moved = 0;
-    const std::int64_t mediaTime = first - mediaStart + Nearest(moved);
+    std::int64_t mediaTime = first - mediaStart + Nearest(moved);
+    const std::int64_t step = clip ? kMediaFrame : mFrame;
+    const bool framesDiffer = item.speed != 1.0 || step != mFrame;
+    if (mBetween == Between::kNearest && framesDiffer && !item.freeze) {
+        const std::int64_t past = (mediaTime % step + step) % step;
+        mediaTime += 2 * past <= step ? -past : step - past;
+    }
     if (clip) {
-        const std::int64_t last = item.media.availableRange->duration / kMediaFrame - 1;
-        mShown.push_back(
-            {item.media.file, mediaTime, std::clamp<std::int64_t>(FrameAt(mediaTime, kMediaFrame), 0, last)});
-        return;
+        // Media that say nothing of their length are taken to be as long as asked.
+        const auto& available = item.media.availableRange;
+        const std::int64_t last = available ? available->duration / kMediaFrame - 1 : INT64_MAX;
+        Sight sight;
+        sight.kind = Sight::Kind::kFrame;
+        sight.frame = {item.media.kind == ReferenceKind::kMissing ? item.name : item.media.file, mediaTime,
+                       std::clamp<std::int64_t>(FrameAt(mediaTime, kMediaFrame), 0, last)};
+        return sight;
     }
     if (!item.freeze && item.speed > 0) return ShowComposition(item, mediaTime);
     // Not forwards: the host shows whole frames of what lies inside.
     const std::int64_t last = std::max<std::int64_t>((LengthOf(item) + mFrame - 1) / mFrame, 1) - 1;
-    ShowComposition(item, std::clamp<std::int64_t>(FrameAt(mediaTime, mFrame), 0, last) * mFrame);
+    return ShowComposition(item, std::clamp<std::int64_t>(FrameAt(mediaTime, mFrame), 0, last) * mFrame);
 }
 
 }  // namespace Vantrel::Host::Test

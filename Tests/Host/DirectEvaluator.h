@@ -10,13 +10,33 @@
 
 namespace Vantrel::Host::Test {
 
+/// What is seen at a moment, as the items say it: a frame of media, layers from the bottom up, or the mix of a
+/// transition's two sides.
+struct Sight {
+    enum class Kind { kFrame, kLayers, kMix };
+
+    Kind kind = Kind::kLayers;
+    Shown frame;
+    /// kMix: the outgoing side and the incoming one; a blank side has no layers.
+    std::vector<Sight> parts;
+    /// kMix: share of the incoming side.
+    double fraction = 0;
+};
+
+/// Which frame stands at a time between two: the one that has begun, as descriptions number frames; or, where frames
+/// don't map one to one, the nearer one, as pictures are rendered.
+enum class Between { kBegun, kNearest };
+
 /// Says what a document shows at a time by going straight from items to media: no segments, no trees, no offsets. It
 /// expands tracks by itself, in floating point, and shares no code with the description.
 class DirectEvaluator {
 public:
-    DirectEvaluator(const Document& document, std::int64_t frameTicks) : mDocument(document), mFrame(frameTicks) {}
+    DirectEvaluator(const Document& document, std::int64_t frameTicks, Between between = Between::kBegun)
+        : mDocument(document), mFrame(frameTicks), mBetween(between) {}
 
     [[nodiscard]] std::vector<Shown> At(std::int64_t time);
+    /// The same with its structure.
+    [[nodiscard]] Sight SightAt(std::int64_t time) { return ShowStack(mDocument.tracks, time); }
 
 private:
     struct Part {
@@ -42,14 +62,14 @@ private:
 
     [[nodiscard]] static Expanded Expand(const Item& track);
     [[nodiscard]] static std::int64_t LengthOf(const Item& composition);
-    void ShowComposition(const Item& composition, std::int64_t time);
-    void ShowStack(const Item& stack, std::int64_t time);
-    void ShowTrack(const Item& track, std::int64_t time);
-    void ShowItem(const Item& item, std::int64_t length, std::int64_t itemTime);
+    [[nodiscard]] Sight ShowComposition(const Item& composition, std::int64_t time);
+    [[nodiscard]] Sight ShowStack(const Item& stack, std::int64_t time);
+    [[nodiscard]] Sight ShowTrack(const Item& track, std::int64_t time);
+    [[nodiscard]] Sight ShowItem(const Item& item, std::int64_t length, std::int64_t itemTime);
 
     const Document& mDocument;
     std::int64_t mFrame;
-    std::vector<Shown> mShown;
+    Between mBetween;
 };
 
 }  // namespace Vantrel::Host::Test

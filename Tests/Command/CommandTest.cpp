@@ -1,0 +1,181 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+// The command as a person meets it: statuses, messages, files.
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+#include <sys/wait.h>
+#include <unistd.h>
+
+#include <array>
+#include <csignal>
+#include <cstdio>
+#include <fstream>
+#include <nlohmann/json.hpp>
+#include <sstream>
+#include <thread>
+
+#include "Host/Media/VideoFile.h"
+#include "Tests/EndToEnd/Film.h"
+#include "Tests/Host/TimelineText.h"
+
+namespace Vantrel::Host::Test {
+namespace {
+
+using testing::HasSubstr;
+
+struct Outcome {
+    int status = -1;
+    std::string out;
+    std::string err;
+};
+
+class Command : public testing::Test {
+protected:
+    /// Runs the command through the shell, so that arguments and settings are written as a person writes them.
+    Outcome Run(const std::string& arguments, const std::string& settings = "") {
+        const std::string errors = mFolder.Path("errors.txt");
+        const std::string line = settings + " " VANTREL_COMMAND " " + arguments + " 2>" + errors;
+        Outcome outcome;
+        FILE* pipe = popen(line.c_str(), "r");
+        std::array<char, 4096> buffer{};
+        for (std::size_t n = 0; (n = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0;)
+            outcome.out.append(buffer.data(), n);
+        const int status = pclose(pipe);
+        outcome.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+        std::stringstream text;
+        text << std::ifstream(errors).rdbuf();
+        outcome.err = text.str();
+        return outcome;
+    }
+    std::string Write(const std::string& name, const std::string& text) {
+        const std::string path = mFolder.Path(name);
+        std::ofstream(path) << text;
+        return path;
+    }
+    std::string Write(const std::string& name, const Json& timeline) { return Write(name, timeline.dump()); }
+    [[nodiscard]] std::string Path(const std::string& name) const { return mFolder.Path(name); }
+
+    /// A small cut of a generated film.
+    std::string WriteFilm(int frames, Json effects = Json::array()) {
+        const Json clip = Clip("bars", Range(0, frames), GeneratorOf("testsrc2"), Effects(std::move(effects)));
+        return Write("cut.otio",
+                     Timeline({Track({clip})}, Own({{"sequence", {{"width", 64}, {"height", 36}, {"rate", 24}}}})));
+    }
+
+private:
+    Folder mFolder{"vantrel-command"};
+};
+
+TEST_F(Command, SaysWhatIsWrongWithAFile) {
+    struct Case {
+        std::string text;
+        std::vector<std::string> words;
+    };
+    const Case cases[] = {
+        {"{\"OTIO_SCHEMA\": \"Timeline.1\", ", {"bad.otio"}},
+        {Timeline({Track({{{"OTIO_SCHEMA", "Hologram.1"}}})}).dump(),
+         {"bad.otio", "Hologram", "/tracks/children/0/children/0"}},
+        {Timeline({Track({Clip("a", Range(0, 10, 0), File("a.mov"))})}).dump(), {"bad.otio", "rate"}},
+        {Timeline({Track({Clip("a", 0, 10, Effects({Effect("TQ.XQVE Invert", {{"1", "half"}})}))})}).dump(),
+         {"bad.otio", "1"}},
+    };
+    for (const Case& bad : cases) {
+        const std::string file = Write("bad.otio", bad.text);
+        const Outcome outcome = Run("render " + file + " -o " + Path("out.mp4"));
+        EXPECT_EQ(outcome.status, 1) << bad.text;
+        for (const std::string& word : bad.words) EXPECT_THAT(outcome.err, HasSubstr(word));
+        EXPECT_FALSE(std::filesystem::exists(Path("out.mp4")));
+    }
+    EXPECT_EQ(Run("render " + Path("nowhere.otio") + " -o " + Path("out.mp4")).status, 1);
+}
+
+TEST_F(Command, SaysWhatIsWrongWithItsArguments) {
+    const std::string file = WriteFilm(5);
+    const std::pair<const char*, const char*> cases[] = {{"--size 0x10", "0x10"},       {"--range 4:2", "4:2"},
+                                                         {"--frame 5", "5 frames"},     {"--quality 9", "quality"},
+                                                         {"--device abacus", "abacus"}, {"--range 0:6", "0:6"}};
+    for (const auto& [argument, word] : cases) {
+        const Outcome outcome = Run("render " + file + " -o " + Path("out.mp4") + " " + argument);
+        EXPECT_EQ(outcome.status, 1) << argument;
+        EXPECT_THAT(outcome.err, HasSubstr(word)) << argument;
+    }
+    for (const char* output : {"out.avi", "out.png"}) {
+        const Outcome outcome = Run("render " + file + " -o " + Path(output));
+        EXPECT_EQ(outcome.status, 3) << output;
+        EXPECT_THAT(outcome.err, HasSubstr(output));
+    }
+    const Outcome folder = Run("render " + file + " -o " + Path("no/such/out.mp4"));
+    EXPECT_EQ(folder.status, 3);
+    EXPECT_THAT(folder.err, HasSubstr("no/such"));
+}
+
+TEST_F(Command, NothingIsReplacedSilently) {
+    const std::string offline =
+        Write("offline.otio", Timeline({Track({Clip("holiday", Range(0, 3), File("missing.mov", 0, 3))})}));
+    const Outcome missing = Run("render " + offline + " -o " + Path("out.mp4") + " --size 64x36");
+    EXPECT_EQ(missing.status, 2);
+    EXPECT_THAT(missing.err, HasSubstr("offline"));
+    EXPECT_THAT(missing.err, HasSubstr("missing.mov"));
+
+    const Outcome passed = Run("render " + WriteFilm(3, {Effect("Sparkle")}) + " -o " + Path("out.mp4"));
+    EXPECT_EQ(passed.status, 2);
+    EXPECT_THAT(passed.err, HasSubstr("Sparkle"));
+    const Outcome strict =
+        Run("render " + WriteFilm(3, {Effect("Sparkle")}) + " -o " + Path("strict.mp4") + " --strict");
+    EXPECT_NE(strict.status, 0);
+    EXPECT_THAT(strict.err, HasSubstr("Sparkle"));
+
+    const Outcome device =
+        Run("render " + WriteFilm(3) + " -o " + Path("none.mp4") + " --device cuda", "KILN_CUDA_DRIVER=none");
+    EXPECT_EQ(device.status, 3);
+    EXPECT_THAT(device.err, HasSubstr("CUDA"));
+    EXPECT_FALSE(std::filesystem::exists(Path("none.mp4")));
+}
+
+TEST_F(Command, WritesFilmsAndPicturesThatReadBack) {
+    const std::string file = WriteFilm(10);
+    for (const char* name : {"film.mp4", "film.mov", "film.mkv"}) {
+        const Outcome outcome = Run("render " + file + " -o " + Path(name));
+        ASSERT_EQ(outcome.status, 0) << outcome.err;
+        VideoFile film(Path(name), 1);
+        EXPECT_EQ(film.GetInfo().width, 64);
+        EXPECT_EQ(film.ReadFrame(9)->height, 36);
+    }
+    ASSERT_EQ(Run("render " + file + " -o " + Path("p%03d.png") + " --range 2:5").status, 0);
+    EXPECT_TRUE(std::filesystem::exists(Path("p002.png")) && std::filesystem::exists(Path("p004.png")));
+    EXPECT_FALSE(std::filesystem::exists(Path("p005.png")));
+    ASSERT_EQ(Run("render " + file + " -o " + Path("one.exr") + " --frame 3 --alpha --size 1x1").status, 0);
+    EXPECT_EQ(VideoFile(Path("one.exr"), 1).GetInfo().width, 1);
+}
+
+TEST_F(Command, LeavesNothingBehindWhenItIsInterruptedOrTheDiskIsFull) {
+    const std::string file = WriteFilm(20000);
+    const Outcome stopped = Run("render " + file + " -o " + Path("long.mp4"), "timeout -s INT 2");
+    EXPECT_NE(stopped.status, 0);
+    EXPECT_THAT(stopped.err, HasSubstr("interrupted"));
+    // A limit on the size of files stands in for a disk that is full.
+    const Outcome full =
+        Run("render " + file + " -o " + Path("full.mkv") + " --range 0:3000", "trap '' XFSZ; ulimit -f 16;");
+    EXPECT_EQ(full.status, 3);
+    EXPECT_THAT(full.err, HasSubstr("full.mkv"));
+    for (const auto& entry : std::filesystem::directory_iterator(Path(""))) {
+        EXPECT_TRUE(entry.path().extension() == ".otio" || entry.path().extension() == ".txt") << entry.path();
+    }
+}
+
+TEST_F(Command, ListsDevicesEffectsAndSegments) {
+    const Json devices = Json::parse(Run("devices --json").out);
+    ASSERT_EQ(devices.size(), 2U);
+    EXPECT_FALSE(devices[0]["devices"].empty());
+    const Json effects = Json::parse(Run("effects --json").out);
+    const auto invert =
+        std::find_if(effects.begin(), effects.end(), [](const Json& e) { return e["matchName"] == "TQ.XQVE Invert"; });
+    ASSERT_NE(invert, effects.end());
+    EXPECT_FALSE((*invert)["parameters"].empty());
+    const Outcome segments = Run("segments " + WriteFilm(5));
+    EXPECT_EQ(segments.status, 0);
+    EXPECT_TRUE(Json::parse(segments.out).is_object());
+}
+
+}  // namespace
+}  // namespace Vantrel::Host::Test

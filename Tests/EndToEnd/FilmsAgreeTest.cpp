@@ -1,0 +1,118 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+// One timeline rendered in several ways must give one film: on either framework, and with too little memory.
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <fstream>
+
+#include "Host/Inspect/TestMedia.h"
+#include "Tests/EndToEnd/Film.h"
+#include "Tests/Host/TimelineText.h"
+
+namespace Vantrel::Host::Test {
+namespace {
+
+struct Difference {
+    int levels = 0;  ///< of 255
+    std::string place;
+};
+
+/// The worst channel of two films' pictures.
+Difference Compare(const Film& a, const Film& b) {
+    Difference worst;
+    EXPECT_EQ(a.pictures.size(), b.pictures.size());
+    for (std::size_t i = 0; i < std::min(a.pictures.size(), b.pictures.size()); ++i) {
+        const HostPicture& one = *a.pictures[i];
+        const HostPicture& other = *b.pictures[i];
+        EXPECT_TRUE(one.width == other.width && one.height == other.height);
+        for (std::int32_t y = 0; y < one.height; ++y) {
+            const auto* rowA = reinterpret_cast<const std::uint8_t*>(one.GetRow(y));
+            const auto* rowB = reinterpret_cast<const std::uint8_t*>(other.GetRow(y));
+            for (std::int32_t x = 0; x < 4 * one.width; ++x) {
+                const int levels = std::abs(rowA[x] - rowB[x]);
+                if (levels <= worst.levels) continue;
+                worst.levels = levels;
+                worst.place = "picture " + std::to_string(i) + ", channel " + std::to_string(x % 4) + " at " +
+                              std::to_string(x / 4) + ", " + std::to_string(y) + ": " + std::to_string(rowA[x]) +
+                              " and " + std::to_string(rowB[x]);
+            }
+        }
+    }
+    return worst;
+}
+
+class FilmsAgree : public testing::Test {
+protected:
+    KeptDevices mDevices;
+};
+
+TEST_F(FilmsAgree, OnBothFrameworksAtEveryQuality) {
+    FilmOptions options;
+    options.frames = {5, 30, 45, 85, 105, 150, 185, 215};
+    for (const std::uint32_t quality : {1U, 2U, 3U, 4U}) {
+        options.quality = quality;
+        options.device = DeviceChoice::kCuda;
+        const Film cuda = RenderFilm(VANTREL_EXAMPLE, options);
+        options.device = DeviceChoice::kOpenCL;
+        const Film opencl = RenderFilm(VANTREL_EXAMPLE, options);
+        EXPECT_TRUE(cuda.failures.empty() && opencl.failures.empty());
+        const Difference worst = Compare(cuda, opencl);
+        // At the lowest quality CUDA works in half floats, whose steps near white are half a level wide.
+        EXPECT_LE(worst.levels, quality == 1 ? 3 : 1) << "quality " << quality << ", " << worst.place;
+    }
+}
+
+class WithLittleMemory : public FilmsAgree {
+protected:
+    /// Three layers, of which two are drawn with motion, in a picture of 3840 by 2160.
+    WithLittleMemory() {
+        WriteTestMedia({{"a.mov", 1, 8, kFrame}, {"b.mov", 700, 8, kFrame}, {"c.mov", 5000, 8, kFrame}},
+                       mFolder.Path(""), [](const std::string&) {});
+        const auto layer = [](const char* name, Json effects) {
+            return Track(
+                {Clip(name, Range(0, 4), File(std::string(name) + ".mov", 0, 8), Effects(std::move(effects)))});
+        };
+        const Json motion = {{"0", {0.3, 0.6}}, {"1", 60.0}, {"3", true}, {"4", 20.0}};
+        const Json timeline =
+            Timeline({layer("a", Json::array()),
+                      layer("b", {Effect("TQ.XQVE Opacity", {{"0", 80.0}}), Effect("TQ.XQVE Motion", motion)}),
+                      layer("c", {Effect("TQ.XQVE Motion", {{"0", {0.7, 0.3}}, {"1", 40.0}, {"3", true}})})},
+                     Own({{"sequence", {{"width", 3840}, {"height", 2160}, {"rate", 24}}}}));
+        std::ofstream(mFile) << timeline.dump();
+        mOptions.mediaRoots = {mFolder.Path("")};
+        mOptions.frames = {1, 3};
+    }
+
+    Folder mFolder{"vantrel-memory"};
+    std::string mFile = mFolder.Path("layers.otio");
+    FilmOptions mOptions;
+};
+
+TEST_F(WithLittleMemory, AFilmIsTheSame) {
+    const Film untroubled = RenderFilm(mFile, mOptions);
+    ASSERT_EQ(untroubled.pictures.size(), 2U);
+    EXPECT_EQ(untroubled.summary.hostFrames, 0);
+    FilmOptions little = mOptions;
+    little.deviceMemory = std::uint64_t{400} << 20;
+    const Film troubled = RenderFilm(mFile, little);
+    const Difference worst = Compare(untroubled, troubled);
+    EXPECT_LE(worst.levels, 1) << worst.place;
+}
+
+TEST_F(WithLittleMemory, RefusedAllocationsDoNotShow) {
+    const Film untroubled = RenderFilm(mFile, mOptions);
+    const Kiln::DeviceRef device = Kiln::GetPrimaryDevice(Kiln::DeviceFramework::kCuda);
+    for (const unsigned n : {2U, 3U, 5U}) {
+        std::atomic<unsigned> count{0};
+        device->GetDeviceMemory()->SetAllocationFilter([&](std::uint64_t) { return ++count % n == 0; });
+        const Film troubled = RenderFilm(mFile, mOptions);
+        device->GetDeviceMemory()->SetAllocationFilter({});
+        EXPECT_GE(count, n);
+        const Difference worst = Compare(untroubled, troubled);
+        EXPECT_LE(worst.levels, 1) << "every " << n << "th refused, " << worst.place;
+    }
+}
+
+}  // namespace
+}  // namespace Vantrel::Host::Test
