@@ -6,8 +6,8 @@
 
 namespace Kiln {
 
-/// How a layer's colour meets what lies below it, numbered alphabetically. Formulas: W3C "Compositing and Blending Level
-/// 1" for the modes that it defines; the others are given with their kernel.
+/// How a layer's colour meets what lies below it, numbered alphabetically. Formulas: W3C "Compositing and Blending
+/// Level 1" for the modes that it defines; the others are given with their kernel.
 enum IR_BlendMode : std::int32_t {
     kBlend_Color = 0,
     kBlend_ColorBurn,

@@ -45,9 +45,9 @@ public:
 /// Is it in device memory?
 [[nodiscard]] bool IsDeviceFrame(const VideoFrameRef& frame);
 
-/// A frame in memory that the device reads fast, shaped for `hostFrame`: its format and attributes. An all-zero rectangle
-/// keeps the host frame's size; otherwise the rectangle's size is made, into which CopyToHostFrame resamples. Empty when
-/// memory is refused.
+/// A frame in memory that the device reads fast, shaped for `hostFrame`: its format and attributes. An all-zero
+/// rectangle keeps the host frame's size; otherwise the rectangle's size is made, into which CopyToHostFrame resamples.
+/// Empty when memory is refused.
 [[nodiscard]] VideoFrameRef AllocateHostFrameForUpload(const DeviceRef& device, const VideoFrameRef& hostFrame,
                                                        Vellum::RenderQuality quality, const Vellum::Rect& rect);
 
@@ -60,26 +60,26 @@ public:
 [[nodiscard]] Status CopyToHostFrame(const VideoFrameRef& target, const VideoFrameRef& source,
                                      Vellum::RenderQuality quality);
 
-/// Uploads a frame that AllocateHostFrameForUpload made, unconverted, to the device that it was made for: the device frame
-/// has the host's layout and attributes. The copy is asynchronous and keeps the host frame alive. Empty when memory is
-/// refused or the frame isn't an upload frame.
+/// Uploads a frame that AllocateHostFrameForUpload made, unconverted, to the device that it was made for: the device
+/// frame has the host's layout and attributes. The copy is asynchronous and keeps the host frame alive. Empty when
+/// memory is refused or the frame isn't an upload frame.
 [[nodiscard]] VideoFrameRef CopyToDevice(const VideoFrameRef& uploadFrame);
 
-/// Reads a device frame of a format that devices render in back into a host frame of BGRA_4444_32f or BGRA_4444_8u of the
-/// same size; values are rounded and clamped for 8 bits. Waits for the device.
+/// Reads a device frame of a format that devices render in back into a host frame of BGRA_4444_32f or BGRA_4444_8u of
+/// the same size; values are rounded and clamped for 8 bits. Waits for the device.
 [[nodiscard]] Status CopyFromDevice(const VideoFrameRef& target, const VideoFrameRef& deviceFrame);
 
 /// Converts an uploaded frame from the host's layout to the format of `target`, which is one that devices render in and
-/// of the same size: levels, matrix, channel order, alpha as the source's attributes say. Premultiplied colour comes out
-/// straight.
+/// of the same size: levels, matrix, channel order, alpha as the source's attributes say. Premultiplied colour comes
+/// out straight.
 [[nodiscard]] Status ConvertFrame(const VideoFrameRef& source, const VideoFrameRef& target);
 
 /// Takes the matte colour (blue, green, red in the lower three bytes) out of colour that was blended with it: in place,
 /// c = m + (c - m) / a, and m where a is 0.
 [[nodiscard]] Status UnpremultiplyFrame(const VideoFrameRef& frame, std::uint32_t matteColor);
 
-/// Replaces, in place, the lines of one field by interpolation from the other. `keep` 0 keeps the even lines (0, 2, ...),
-/// 1 the odd ones.
+/// Replaces, in place, the lines of one field by interpolation from the other. `keep` 0 keeps the even lines (0, 2,
+/// ...), 1 the odd ones.
 [[nodiscard]] Status DeinterlaceFrame(const VideoFrameRef& frame, std::int32_t keep);
 
 /// Copies pixels between device frames; sizes and formats may differ. Resamples by quality when sizes do.

@@ -9,7 +9,7 @@ namespace Kiln {
 /// One device module in all the forms that a build made of it. The build generates these tables; see
 /// cmake/DeviceModules.cmake. Every pointer is to static storage.
 struct ModuleImage {
-    const char* key;  ///< as FindModule takes it, with back-slashes and without an extension
+    const char* key;           ///< as FindModule takes it, with back-slashes and without an extension
     const char* openclSource;  ///< the complete source text, dialect header included
     std::size_t openclSourceBytes;
     const void* cpuImage;  ///< a shared object for the CPU driver

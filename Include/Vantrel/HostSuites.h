@@ -68,8 +68,8 @@ struct CorvaneVideoSegmentSuite {
                                                                 std::uint32_t* segmentsID);
 };
 
-/// What a host render shall produce. `pixelFormats` lists four-character codes in order of preference; a count of 2 whose
-/// second entry is 0 means the first one only.
+/// What a host render shall produce. `pixelFormats` lists four-character codes in order of preference; a count of 2
+/// whose second entry is 0 means the first one only.
 struct VantrelRenderDescription {
     const std::uint32_t* pixelFormats;
     std::int32_t pixelFormatCount;
@@ -109,19 +109,19 @@ struct CorvaneVideoSegmentRenderSuite {
     VantrelHostStatus (*GetNodeFrameHash)(std::uint32_t sequenceID, std::uint32_t nodeID, std::int64_t time,
                                           std::int64_t nodeTime, std::int64_t frameTicks, std::int32_t sequenceWidth,
                                           std::int32_t sequenceHeight, std::int32_t aspectNumerator,
-                                          std::int32_t aspectDenominator,
-                                          const VantrelRenderDescription* description, char* hashText);
+                                          std::int32_t aspectDenominator, const VantrelRenderDescription* description,
+                                          char* hashText);
     /// Renders a clip with its operators from `firstOperator` up to but not including `endOperator`.
-    VantrelHostStatus (*RenderOperators)(std::uint32_t sequenceID, std::uint32_t clipNodeID,
-                                         std::int32_t firstOperator, std::int32_t endOperator, std::int64_t time,
-                                         std::int64_t rawTime, std::int64_t frameTicks, std::int32_t sequenceWidth,
+    VantrelHostStatus (*RenderOperators)(std::uint32_t sequenceID, std::uint32_t clipNodeID, std::int32_t firstOperator,
+                                         std::int32_t endOperator, std::int64_t time, std::int64_t rawTime,
+                                         std::int64_t frameTicks, std::int32_t sequenceWidth,
                                          std::int32_t sequenceHeight, std::int32_t aspectNumerator,
                                          std::int32_t aspectDenominator, std::uint32_t reserved,
                                          const VantrelRenderDescription* description, VantrelRenderCallback callback,
                                          void* context, std::uint32_t* requestID);
     VantrelHostStatus (*GetOperatorsFrameHash)(std::uint32_t sequenceID, std::uint32_t clipNodeID,
-                                               std::int32_t firstOperator, std::int32_t endOperator,
-                                               std::int64_t time, std::int64_t rawTime, std::int64_t frameTicks,
+                                               std::int32_t firstOperator, std::int32_t endOperator, std::int64_t time,
+                                               std::int64_t rawTime, std::int64_t frameTicks,
                                                std::int32_t sequenceWidth, std::int32_t sequenceHeight,
                                                std::int32_t aspectNumerator, std::int32_t aspectDenominator,
                                                std::uint32_t reserved, const VantrelRenderDescription* description,

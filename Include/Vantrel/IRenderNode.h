@@ -53,8 +53,8 @@ public:
     /// through the host.
     virtual Status Configure(const VideoNodeRef& description, const RenderRequirements& requirements, bool& host) = 0;
     /// Yields this node's host-memory frame; without `blocking` it may only be staged for later.
-    virtual Status FetchHostFrame(const RenderToken& token, const RenderParams& params,
-                                  const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) = 0;
+    virtual Status FetchHostFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
+                                  bool blocking, VideoFrameRef& frame) = 0;
     /// Yields this node's finished device frame.
     virtual Status RenderFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                                VideoFrameRef& frame) = 0;

@@ -14,7 +14,8 @@ namespace Vantrel {
 struct RenderParams {
     /// Copied along, read by nobody here.
     std::uint32_t reservedWord = 0;
-    /// Ticks on the timeline of this tree. With the node pointer it keys the hash memo, and the host's calls receive it.
+    /// Ticks on the timeline of this tree. With the node pointer it keys the hash memo, and the host's calls receive
+    /// it.
     std::int64_t time = 0;
     /// The same instant as the nodes see it: for a segment time - info.in + info.offset. What moves one moves both.
     std::int64_t clipTime = 0;

@@ -16,11 +16,12 @@
 
 namespace Vantrel {
 
-/// Renders one sequence on one device. Held by shared pointer; all render systems must be gone before the last Terminate.
+/// Renders one sequence on one device. Held by shared pointer; all render systems must be gone before the last
+/// Terminate.
 ///
-/// Any thread may call the first five operations and PrepareRender. RenderFrames runs on the caller's thread, which holds
-/// the device (Kiln::Device::AcquireExclusiveAccess) across the call and keeps UpdateTimeline from running meanwhile. One
-/// thread in the process is in RenderFrames at a time, whatever the device.
+/// Any thread may call the first five operations and PrepareRender. RenderFrames runs on the caller's thread, which
+/// holds the device (Kiln::Device::AcquireExclusiveAccess) across the call and keeps UpdateTimeline from running
+/// meanwhile. One thread in the process is in RenderFrames at a time, whatever the device.
 class RenderSystem {
 public:
     virtual ~RenderSystem() = default;
@@ -33,15 +34,16 @@ public:
     /// The hash of the segment list last read; nil after a failed update.
     [[nodiscard]] virtual Guid GetTimelineHash() = 0;
 
-    /// What lies at a time, in ticks. `merged` selects the statistics across nesting levels; trees are only to be rendered
-    /// from the other map. Returns 0, or 11 when no segment covers the time.
+    /// What lies at a time, in ticks. `merged` selects the statistics across nesting levels; trees are only to be
+    /// rendered from the other map. Returns 0, or 11 when no segment covers the time.
     virtual Status GetSegmentInfo(std::int64_t ticks, SegmentInfo& info, bool merged) = 0;
 
     /// Returns 0, or 99 when no sequence has been read. Takes no lock.
     virtual Status GetSequenceFormat(Vellum::Rect& rect, Vellum::PixelAspectRatio& aspect, Vellum::FrameRate& rate,
                                      std::uint32_t& fieldType) = 0;
 
-    /// Queues the staging of a frame's host pictures and returns at once. The caller has counted this piece in `results`.
+    /// Queues the staging of a frame's host pictures and returns at once. The caller has counted this piece in
+    /// `results`.
     virtual void PrepareRender(const RenderNodeRef& root, const boost::shared_ptr<RenderParams>& params,
                                const RenderResultsRef& results) = 0;
 

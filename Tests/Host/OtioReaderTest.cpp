@@ -15,7 +15,7 @@ using testing::HasSubstr;
 
 std::string ErrorOf(const std::string& text) {
     try {
-        static_cast<void>(ReadTimelineText(text, "/work/film.otio"));
+        static_cast<void>(ReadTimelineText(text, "/films/film.otio"));
     } catch (const TimelineError& error) {
         return error.what();
     }
@@ -29,7 +29,7 @@ Json WithClip(const std::function<void(Json&)>& spoil, Json clip = Clip("A", 0, 
     return Timeline({Track({std::move(clip)})});
 }
 
-constexpr const char* kClipPath = "/work/film.otio: /tracks/children/0/children/0";
+constexpr const char* kClipPath = "/films/film.otio: /tracks/children/0/children/0";
 
 TEST(OtioReader, ErrorsNameFilePlaceAndThing) {
     struct Case {
@@ -89,7 +89,7 @@ TEST(OtioReader, ErrorsNameFilePlaceAndThing) {
 
 TEST(OtioReader, BrokenFilesAreToldByLineAndColumn) {
     EXPECT_THAT(ErrorOf(std::string("{\n  \"a\": [1, 2\n")),
-                HasSubstr("/work/film.otio: line 3, column 1: not valid JSON"));
+                HasSubstr("/films/film.otio: line 3, column 1: not valid JSON"));
     EXPECT_THAT(ErrorOf(std::string("")), HasSubstr("not valid JSON"));
     EXPECT_THAT(ErrorOf(std::string("[]")), HasSubstr("expected an object"));
     EXPECT_THAT(ErrorOf(std::string(R"({"OTIO_SCHEMA": "Marker.1"})")), HasSubstr("unknown schema \"Marker\""));
@@ -150,7 +150,7 @@ TEST(OtioReader, ReferencesBecomePaths) {
     EXPECT_EQ(fileOf("file:///media/a%20b%2541.mov"), "/media/a b%41.mov");
     EXPECT_EQ(fileOf("file://localhost/media/a.mov"), "/media/a.mov");
     EXPECT_EQ(fileOf("/media/a%20b.mov"), "/media/a%20b.mov");
-    EXPECT_EQ(fileOf("clips/../a.mov"), "/work/a.mov");
+    EXPECT_EQ(fileOf("clips/../a.mov"), "/films/a.mov");
     EXPECT_EQ(fileOf("https://example.org/a.mov"), "");
     const Json images = {{"OTIO_SCHEMA", "ImageSequenceReference.1"},
                          {"target_url_base", "file:///media/shot"},

@@ -134,7 +134,7 @@ public:
     std::map<std::string, int> probes;
 };
 
-inline Document Read(const Json& timeline) { return ReadTimelineText(timeline.dump(), "/work/film.otio"); }
+inline Document Read(const Json& timeline) { return ReadTimelineText(timeline.dump(), "/films/film.otio"); }
 
 /// A snapshot of a timeline with media of its own.
 struct Described {

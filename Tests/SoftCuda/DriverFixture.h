@@ -23,26 +23,25 @@ namespace SoftCudaTest {
 [[nodiscard]] void* GetLibrary();
 [[nodiscard]] void* FindEntry(const std::string& name);
 
-#define TEST_ENTRIES(X)                                                                                                \
-    X(cuInit)                                                                                                          \
-    X(cuDriverGetVersion)                                                                                              \
-    X(cuDeviceGetCount) X(cuDeviceGet) X(cuDeviceGetName) X(cuDeviceGetAttribute) X(cuDeviceTotalMem_v2)               \
-        X(cuCtxCreate_v2) X(cuCtxDestroy_v2) X(cuCtxPushCurrent_v2) X(cuCtxPopCurrent_v2) X(cuCtxSetCurrent)           \
-            X(cuCtxGetCurrent) X(cuCtxSynchronize) X(cuModuleLoadData) X(cuModuleUnload) X(cuModuleGetFunction)        \
-                X(cuModuleGetGlobal_v2) X(cuMemGetInfo_v2) X(cuMemAlloc_v2) X(cuMemAllocPitch_v2) X(cuMemFree_v2)      \
-                    X(cuMemGetAddressRange_v2) X(cuMemHostAlloc) X(cuMemFreeHost) X(cuMemHostRegister_v2)              \
-                        X(cuMemHostUnregister) X(cuMemcpyHtoD_v2) X(cuMemcpyDtoH_v2) X(cuMemcpyHtoDAsync_v2)           \
-                            X(cuMemcpyDtoHAsync_v2) X(cuMemcpyDtoDAsync_v2) X(cuMemcpy2D_v2) X(cuMemcpy2DAsync_v2)     \
-                                X(cuMemsetD8_v2) X(cuMemsetD16_v2) X(cuMemsetD32_v2) X(cuMemsetD2D8_v2)                \
-                                    X(cuMemsetD2D32_v2) X(cuFuncSetBlockShape) X(cuParamSetSize) X(cuParamSetv)        \
-                                        X(cuParamSeti) X(cuParamSetf) X(cuLaunchGrid) X(cuLaunchGridAsync)             \
-                                            X(cuLaunchKernel) X(cuStreamCreate) X(cuStreamDestroy_v2) X(cuStreamQuery) \
-                                                X(cuStreamSynchronize) X(cuStreamWaitEvent) X(cuEventCreate)           \
-                                                    X(cuEventDestroy_v2) X(cuEventRecord) X(cuEventQuery)              \
-                                                        X(cuEventSynchronize) X(cuEventElapsedTime) X(cuGetErrorName)  \
-                                                            X(SoftCudaSetFailEvery) X(SoftCudaSetFusing)               \
-                                                                X(SoftCudaSetThreads) X(SoftCudaGetCounters)           \
-                                                                    X(SoftCudaGetMessage)
+// clang-format off
+#define TEST_ENTRIES(X) \
+    X(cuInit) X(cuDriverGetVersion) X(cuDeviceGetCount) X(cuDeviceGet) \
+    X(cuDeviceGetName) X(cuDeviceGetAttribute) X(cuDeviceTotalMem_v2) X(cuCtxCreate_v2) \
+    X(cuCtxDestroy_v2) X(cuCtxPushCurrent_v2) X(cuCtxPopCurrent_v2) X(cuCtxSetCurrent) \
+    X(cuCtxGetCurrent) X(cuCtxSynchronize) X(cuModuleLoadData) X(cuModuleUnload) \
+    X(cuModuleGetFunction) X(cuModuleGetGlobal_v2) X(cuMemGetInfo_v2) X(cuMemAlloc_v2) \
+    X(cuMemAllocPitch_v2) X(cuMemFree_v2) X(cuMemGetAddressRange_v2) X(cuMemHostAlloc) \
+    X(cuMemFreeHost) X(cuMemHostRegister_v2) X(cuMemHostUnregister) X(cuMemcpyHtoD_v2) \
+    X(cuMemcpyDtoH_v2) X(cuMemcpyHtoDAsync_v2) X(cuMemcpyDtoHAsync_v2) X(cuMemcpyDtoDAsync_v2) \
+    X(cuMemcpy2D_v2) X(cuMemcpy2DAsync_v2) X(cuMemsetD8_v2) X(cuMemsetD16_v2) \
+    X(cuMemsetD32_v2) X(cuMemsetD2D8_v2) X(cuMemsetD2D32_v2) X(cuFuncSetBlockShape) \
+    X(cuParamSetSize) X(cuParamSetv) X(cuParamSeti) X(cuParamSetf) \
+    X(cuLaunchGrid) X(cuLaunchGridAsync) X(cuLaunchKernel) X(cuStreamCreate) \
+    X(cuStreamDestroy_v2) X(cuStreamQuery) X(cuStreamSynchronize) X(cuStreamWaitEvent) \
+    X(cuEventCreate) X(cuEventDestroy_v2) X(cuEventRecord) X(cuEventQuery) \
+    X(cuEventSynchronize) X(cuEventElapsedTime) X(cuGetErrorName) X(SoftCudaSetFailEvery) \
+    X(SoftCudaSetFusing) X(SoftCudaSetThreads) X(SoftCudaGetCounters) X(SoftCudaGetMessage)
+// clang-format on
 
 struct Driver {
 #define TEST_DECLARE(name) decltype(&::name) name = nullptr;
