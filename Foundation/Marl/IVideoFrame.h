@@ -24,7 +24,8 @@ public:
 
     /// The picture's rectangle, with left and top 0.
     [[nodiscard]] virtual Vellum::Rect GetBounds() const = 0;
-    /// Where the picture's corner lies in the frame that it will be part of, in pixels; (0, 0) for a finished one.
+    /// Where the corner of the frame that it will be part of lies in this picture, in pixels: above 0 for a picture
+    /// that is larger than the frame, below 0 for a smaller one, (0, 0) for a finished one.
     [[nodiscard]] virtual Vellum::Point GetOrigin() const = 0;
     virtual void SetOrigin(Vellum::Point origin) = 0;
     [[nodiscard]] virtual Vellum::PixelFormat GetPixelFormat() const = 0;

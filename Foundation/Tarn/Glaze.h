@@ -21,7 +21,7 @@ struct Glaze {
     std::int32_t aspectDenominator;
     std::uint32_t fieldType;
     std::uint32_t alphaType;  ///< Vellum's kAlphaType values
-    std::int32_t originX;     ///< place of the picture in its frame, pixels
+    std::int32_t originX;     ///< where the frame's corner lies in the picture, pixels
     std::int32_t originY;
     std::int32_t rowBytes;  ///< at least width times the bytes of a pixel
     std::uint32_t reserved;
