@@ -113,8 +113,15 @@ std::shared_ptr<HostPicture> FrameLoop::RenderOnDevice(const RenderJob& job, Req
     const Kiln::ScopedDeviceAccess hold(mSystem->GetDevice());
     VideoFrameRef first;
     VideoFrameRef second;
-    const Status status = mSystem->RenderFrames(request.info.tree, request.params, request.results, first, second,
-                                                job.report ? &report : nullptr, request.params->outputRect);
+    Status status = Ostrand::kStatus_Failure;
+    try {
+        status = mSystem->RenderFrames(request.info.tree, request.params, request.results, first, second,
+                                       job.report ? &report : nullptr, request.params->outputRect);
+    } catch (const Ostrand::NullInterfaceException&) {
+        // A host picture that never came, or came too late for its copy, leaves a node without a frame: the engine
+        // reports that by this exception. The frame is then the host's to make, like any other that the device can't.
+        return nullptr;
+    }
     if (Ostrand::Failed(status)) return nullptr;
     if (!first) return MakeTransparentPicture(*mPool, job.format, job.width, job.height);
     std::shared_ptr<HostPicture> picture = TakeFinishedFrame(*mPool, first, job.format);
