@@ -118,8 +118,8 @@ std::shared_ptr<HostPicture> FrameLoop::RenderOnDevice(const RenderJob& job, Req
         status = mSystem->RenderFrames(request.info.tree, request.params, request.results, first, second,
                                        job.report ? &report : nullptr, request.params->outputRect);
     } catch (const Ostrand::NullInterfaceException&) {
-        // A host picture that never came, or came too late for its copy, leaves a node without a frame: the engine
-        // reports that by this exception. The frame is then the host's to make, like any other that the device can't.
+        // Without memory for a picture a node is left without a frame, which the engine reports by this exception. The
+        // frame is then the host's to make, like any other that the device can't.
         return nullptr;
     }
     if (Ostrand::Failed(status)) return nullptr;

@@ -69,7 +69,9 @@ void PendingHostMemoryCopyManager::Complete(const Kiln::DeviceRef& device, const
     const auto entry = mWaiters.find(hash);
     if (entry != mWaiters.end()) {
         for (const RenderResultsRef& waiter : entry->second) {
-            waiter->StoreFrame(hash, frame);
+            // A store keeps the first entry under a fingerprint: an empty one would shut out the frame of a later copy
+            // that another request begins and this one waits for.
+            if (frame) waiter->StoreFrame(hash, frame);
             waiter->EndAsyncPiece();
         }
         mWaiters.erase(entry);

@@ -165,6 +165,19 @@ TEST_F(PendingCopies, AFailedCopyReleasesItsWaitersAndCachesNothing) {
     EXPECT_FALSE(Cache().FindFrame(kHash));
 }
 
+TEST_F(PendingCopies, ARequestWhoseOwnCopyFailedStillGetsThatOfAnother) {
+    const RenderResultsRef early = MakeResults();
+    EXPECT_FALSE(GetOrClaim(early, false));
+    mManager.Complete(mDevice, kHash, {});  // its host frame hadn't come yet
+
+    const RenderResultsRef late = MakeResults();
+    EXPECT_FALSE(GetOrClaim(late, false));
+    Queue();
+    EXPECT_TRUE(GetOrClaim(early, true));
+    EXPECT_EQ(mFrame, mMade);
+    EXPECT_EQ(early->FindFrame(kHash), mMade);
+}
+
 TEST_F(PendingCopies, TheLastPieceRunsTheCompletionOnce) {
     int completions = 0;
     const auto results = boost::make_shared<RenderResults>([&] { ++completions; }, 1);
