@@ -63,9 +63,10 @@ typedef unsigned long ulong;
 
 // The arguments' fixed names are spoken although only GPU code needs them, so that a wrong one fails here as well.
 #define DIALECT_FRAME_NAMES(frame, pitch) (void)(frame), (void)(pitch), (void)(format)
-#define POSITION(x, y)             \
+// Parameters named like a member of the cell would rename that as well.
+#define POSITION(column, row)      \
     (void)(width), (void)(height); \
-    [[maybe_unused]] const int x = cell_.x + cell_.lane, y = cell_.y
+    [[maybe_unused]] const int column = cell_.x + cell_.lane, row = cell_.y
 #define SOURCE_PIXEL(p)               \
     DIALECT_FRAME_NAMES(in, inPitch); \
     const Float4 p = LoadStrip(cell_.source, cell_.lane)
@@ -81,7 +82,7 @@ typedef unsigned long ulong;
 #define STORE(value) (DIALECT_FRAME_NAMES(out, outPitch), StoreStrip(cell_.target, cell_.lane, value))
 #define STORE_WORK(value) (DIALECT_FRAME_NAMES(frame, pitch), StoreStrip(cell_.target, cell_.lane, value))
 
-#define LANE_POSITION_IN(x, y, lanes, itemsX, itemsY) \
-    const int x = cell_.x, y = cell_.y;               \
-    if (x >= (itemsX) || y >= (itemsY)) return;       \
-    [[maybe_unused]] const int lanes = x + LANES <= (itemsX) ? LANES : (itemsX)-x
+#define LANE_POSITION_IN(column, row, lanes, itemsX, itemsY) \
+    const int column = cell_.x, row = cell_.y;               \
+    if (column >= (itemsX) || row >= (itemsY)) return;       \
+    [[maybe_unused]] const int lanes = column + LANES <= (itemsX) ? LANES : (itemsX)-column
