@@ -22,6 +22,17 @@ namespace {
 
 using Work = boost::function<void()>;
 
+/// Runs a queue's first piece of work outside of the lock that guards the queue.
+void RunFirstOf(std::deque<Work>& queue, std::unique_lock<std::mutex>& lock) {
+    Work work = std::move(queue.front());
+    queue.pop_front();
+    lock.unlock();
+    work();
+    // What the work holds may end here, the last executor of its queue included; hence outside the lock as well.
+    work.clear();
+    lock.lock();
+}
+
 /// A queue of work and the loop that its threads run. Once closed, the loop ends when the queue is empty.
 class WorkLoop {
 public:
@@ -52,13 +63,7 @@ public:
         for (;;) {
             mWake.wait(lock, [this] { return mClosed || !mQueue.empty(); });
             if (mQueue.empty()) break;
-            Work work = std::move(mQueue.front());
-            mQueue.pop_front();
-            lock.unlock();
-            work();
-            // What the work holds may end here, this loop's last executor included; hence outside the lock.
-            work.clear();
-            lock.lock();
+            RunFirstOf(mQueue, lock);
         }
         --mThreadsInside;
     }
@@ -199,12 +204,7 @@ private:
 
     void RunFirst() {
         std::unique_lock<std::mutex> lock(mMutex);
-        Work work = std::move(mQueue.front());
-        mQueue.pop_front();
-        lock.unlock();
-        work();
-        work.clear();
-        lock.lock();
+        RunFirstOf(mQueue, lock);
         mInLoop = !mQueue.empty();
         if (!mInLoop) return;
         lock.unlock();
