@@ -119,7 +119,7 @@ Status UploadNode::RequestHostFrames(const RenderParams& params, const RenderRes
             results->StoreFrame(hash, staged);
         }
     }
-    return RenderNodeBase::RequestHostFrames(transformed, results);
+    return WalkInputs([&](IRenderNode& input, std::size_t) { return input.RequestHostFrames(transformed, results); });
 }
 
 Status UploadNode::CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
@@ -130,10 +130,18 @@ Status UploadNode::CollectHostFrames(const RenderParams& params, const RenderRes
     if (previous && !hash.IsNil()) {
         if (const VideoFrameRef staged = previous->FindFrame(hash)) results->StoreFrame(hash, staged);
     }
-    return RenderNodeBase::CollectHostFrames(transformed, results, previous);
+    return WalkInputs(
+        [&](IRenderNode& input, std::size_t) { return input.CollectHostFrames(transformed, results, previous); });
 }
 
 bool UploadNode::HasClipInput() const { return HasInterface(GetInput(0).Get(), kHostRenderClipPrefetchID); }
+
+Status UploadNode::FetchInput(const RenderToken& token, const RenderParams& transformed,
+                              const RenderResultsRef& results, VideoFrameRef& hostFrame) {
+    return WalkInputs([&](IRenderNode& input, std::size_t) {
+        return input.FetchHostFrame(token, transformed, results, true, hostFrame);
+    });
+}
 
 Status UploadNode::FetchHostFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                                   bool blocking, VideoFrameRef& frame) {
@@ -149,7 +157,7 @@ Status UploadNode::FetchHostFrame(const RenderToken& token, const RenderParams& 
     if (shared && copies.GetOrClaim(mDevice, hash, blocking, results, frame)) return Ostrand::kStatus_OK;
 
     VideoFrameRef hostFrame;
-    const Status status = RenderNodeBase::FetchHostFrame(token, transformed, results, true, hostFrame);
+    const Status status = FetchInput(token, transformed, results, hostFrame);
     if (!Ostrand::Failed(status) && hostFrame) {
         const Vellum::Rect rect = HasClipInput() ? Vellum::Rect() : params.outputRect;
         frame = Kiln::AllocateHostFrameForUpload(mDevice, hostFrame, Vellum::ToRenderQuality(params.quality), rect);
@@ -175,7 +183,7 @@ Status UploadNode::FetchHostFrame(const RenderToken& token, const RenderParams& 
 Status UploadNode::CopyToUploadFrame(const Guid& hash, const VideoFrameRef& uploadFrame,
                                      const RenderParams& transformed, const RenderResultsRef& results) {
     VideoFrameRef hostFrame;
-    Status status = RenderNodeBase::FetchHostFrame({}, transformed, results, true, hostFrame);
+    Status status = FetchInput({}, transformed, results, hostFrame);
     if (!Ostrand::Failed(status)) {
         status = Kiln::CopyToHostFrame(uploadFrame, hostFrame, Vellum::ToRenderQuality(transformed.quality));
     }

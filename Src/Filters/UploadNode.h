@@ -43,6 +43,9 @@ private:
     [[nodiscard]] Guid GetHostFrameHash(const RenderParams& transformed, const RenderResultsRef& results);
     [[nodiscard]] Guid GetUnconvertedFrameHash(const RenderParams& transformed, const RenderResultsRef& results);
 
+    /// The picture as the producer has it, asked for with params that have been transformed.
+    Status FetchInput(const RenderToken& token, const RenderParams& transformed, const RenderResultsRef& results,
+                      VideoFrameRef& hostFrame);
     /// Copies the host frame into upload memory and tells everybody who waits for it.
     Status CopyToUploadFrame(const Guid& hash, const VideoFrameRef& uploadFrame, const RenderParams& transformed,
                              const RenderResultsRef& results);

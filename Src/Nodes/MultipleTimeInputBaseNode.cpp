@@ -33,28 +33,8 @@ Status MultipleTimeInputBaseNode::WalkTimes(const RenderParams& params, const Vi
     return Ostrand::kStatus_OK;
 }
 
-Status MultipleTimeInputBaseNode::RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) {
-    return WalkTimes(params,
-                     [&](const RenderParams& moved) { return RenderNodeBase::RequestHostFrames(moved, results); });
-}
-
-Status MultipleTimeInputBaseNode::CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) {
-    return WalkTimes(params,
-                     [&](const RenderParams& moved) { return RenderNodeBase::CancelHostFrames(moved, results); });
-}
-
-Status MultipleTimeInputBaseNode::BeginUpload(const RenderToken& token, const RenderParams& params,
-                                              const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) {
-    return WalkTimes(params, [&](const RenderParams& moved) {
-        return RenderNodeBase::BeginUpload(token, moved, results, blocking, frame);
-    });
-}
-
-Status MultipleTimeInputBaseNode::FetchHostFrame(const RenderToken& token, const RenderParams& params,
-                                                 const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) {
-    return WalkTimes(params, [&](const RenderParams& moved) {
-        return RenderNodeBase::FetchHostFrame(token, moved, results, blocking, frame);
-    });
+Status MultipleTimeInputBaseNode::WalkPhase(const RenderParams& params, const InputCall& call) {
+    return WalkTimes(params, [&](const RenderParams& moved) { return RenderNodeBase::WalkPhase(moved, call); });
 }
 
 Status MultipleTimeInputBaseNode::RenderFrame(const RenderToken& token, const RenderParams& params,
@@ -67,12 +47,6 @@ Status MultipleTimeInputBaseNode::EndFrame(const RenderToken& token, const Rende
                                            const RenderResultsRef& results, std::uint32_t level) {
     return WalkTimes(params,
                      [&](const RenderParams& moved) { return FilterNode::EndFrame(token, moved, results, level); });
-}
-
-Status MultipleTimeInputBaseNode::CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
-                                                    const RenderResultsRef& previous) {
-    return WalkTimes(
-        params, [&](const RenderParams& moved) { return RenderNodeBase::CollectHostFrames(moved, results, previous); });
 }
 
 }  // namespace Vantrel

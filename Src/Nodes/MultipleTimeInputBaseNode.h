@@ -26,24 +26,17 @@ class MultipleTimeInputBaseNode : public FilterNode {
 public:
     using FilterNode::FilterNode;
 
-    Status RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) override;
-    Status CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) override;
-    Status BeginUpload(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
-                       bool blocking, VideoFrameRef& frame) override;
-    Status FetchHostFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
-                          bool blocking, VideoFrameRef& frame) override;
     Status RenderFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                        VideoFrameRef& frame) override;
     Status EndFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                     std::uint32_t level) override;
-    Status CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
-                             const RenderResultsRef& previous) override;
 
     /// Reads only `params` and what Configure stored; any thread of any phase. All phases of a request must get the
     /// same times. `forRender` tells the call that renders from those that make ready.
     virtual void GetInputTimes(const RenderParams& params, SampleSet& times, bool forRender) = 0;
 
 protected:
+    Status WalkPhase(const RenderParams& params, const InputCall& call) override;
     /// The params that ask for one sample: a lone moment as the field that it lies in, several as the whole frame.
     [[nodiscard]] static RenderParams MakeParamsForTime(const RenderParams& params,
                                                         const SampleSet::value_type& sample);

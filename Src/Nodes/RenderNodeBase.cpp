@@ -35,19 +35,28 @@ void RenderNodeBase::SetInput(std::size_t index, const RenderNodeRef& node) {
     mInputs[index] = node;
 }
 
+Status RenderNodeBase::WalkPhase(const RenderParams& params, const InputCall& call) {
+    return WalkInputs([&](IRenderNode& input, std::size_t) { return call(input, params); });
+}
+
 Status RenderNodeBase::RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) {
-    return WalkInputs([&](IRenderNode& input, std::size_t) { return input.RequestHostFrames(params, results); });
+    return WalkPhase(params, [&](IRenderNode& input, const RenderParams& wanted) {
+        return input.RequestHostFrames(wanted, results);
+    });
 }
 
 Status RenderNodeBase::CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) {
-    VisitInputs([&](IRenderNode& input, std::size_t) { input.CancelHostFrames(params, results); });
-    return Ostrand::kStatus_OK;
+    return WalkPhase(params, [&](IRenderNode& input, const RenderParams& wanted) {
+        input.CancelHostFrames(wanted, results);
+        return Ostrand::kStatus_OK;
+    });
 }
 
 Status RenderNodeBase::BeginUpload(const RenderToken& token, const RenderParams& params,
                                    const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) {
-    return WalkInputs(
-        [&](IRenderNode& input, std::size_t) { return input.BeginUpload(token, params, results, blocking, frame); });
+    return WalkPhase(params, [&](IRenderNode& input, const RenderParams& wanted) {
+        return input.BeginUpload(token, wanted, results, blocking, frame);
+    });
 }
 
 Status RenderNodeBase::Configure(const VideoNodeRef& description, const RenderRequirements& requirements,
@@ -63,8 +72,9 @@ Status RenderNodeBase::Configure(const VideoNodeRef& description, const RenderRe
 
 Status RenderNodeBase::FetchHostFrame(const RenderToken& token, const RenderParams& params,
                                       const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) {
-    return WalkInputs(
-        [&](IRenderNode& input, std::size_t) { return input.FetchHostFrame(token, params, results, blocking, frame); });
+    return WalkPhase(params, [&](IRenderNode& input, const RenderParams& wanted) {
+        return input.FetchHostFrame(token, wanted, results, blocking, frame);
+    });
 }
 
 Status RenderNodeBase::RenderFrame(const RenderToken& token, const RenderParams& params,
@@ -81,8 +91,9 @@ Status RenderNodeBase::EndFrame(const RenderToken& token, const RenderParams& pa
 
 Status RenderNodeBase::CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
                                          const RenderResultsRef& previous) {
-    return WalkInputs(
-        [&](IRenderNode& input, std::size_t) { return input.CollectHostFrames(params, results, previous); });
+    return WalkPhase(params, [&](IRenderNode& input, const RenderParams& wanted) {
+        return input.CollectHostFrames(wanted, results, previous);
+    });
 }
 
 Guid RenderNodeBase::GetFrameHash(const RenderParams& params, const RenderResultsRef& results) {

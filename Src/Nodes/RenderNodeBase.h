@@ -11,6 +11,22 @@
 
 namespace Vantrel {
 
+/// What a phase does with an input, called with the params that are meant for it. It refers to a function that outlives
+/// the call it is passed to: walks are frequent, and nothing is copied or allocated for them.
+class InputCall {
+public:
+    template <class Call>
+    InputCall(const Call& call)  // NOLINT(google-explicit-constructor): stands for the function in argument lists
+        : mCall(&call), mInvoke([](const void* function, IRenderNode& input, const RenderParams& params) -> Status {
+              return (*static_cast<const Call*>(function))(input, params);
+          }) {}
+    Status operator()(IRenderNode& input, const RenderParams& params) const { return mInvoke(mCall, input, params); }
+
+private:
+    const void* mCall;
+    Status (*mInvoke)(const void* call, IRenderNode& input, const RenderParams& params);
+};
+
 /// What all nodes share: inputs, description, requirements, and phases that simply walk the inputs.
 ///
 /// The phases with a status call each input in turn and stop at the first failure, so that the last input wins the out
@@ -71,6 +87,10 @@ public:
 protected:
     /// The counter of the concrete class.
     [[nodiscard]] virtual std::atomic<std::int32_t>& GetRef() = 0;
+
+    /// The walk of the phases that make host frames ready: requests, cancels, uploads, fetches, collections. A subclass
+    /// decides here which inputs they reach and with which params; a walk ends at the first call that fails.
+    virtual Status WalkPhase(const RenderParams& params, const InputCall& call);
 
     /// Calls `visit(input, index)` for each input that isn't null until one fails. Inputs may be added meanwhile.
     template <class Visit>

@@ -10,26 +10,14 @@ SelectInputBaseNode::Choice SelectInputBaseNode::Choose(const RenderParams& para
     return choice;
 }
 
-Status SelectInputBaseNode::RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) {
+Status SelectInputBaseNode::WalkPhase(const RenderParams& params, const InputCall& call) {
     const Choice choice = Choose(params);
-    return choice.input->RequestHostFrames(choice.params, results);
+    return call(*choice.input, choice.params);
 }
 
 Status SelectInputBaseNode::CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) {
     const Choice choice = Choose(params);
     return choice.input->CancelHostFrames(choice.params, results);
-}
-
-Status SelectInputBaseNode::BeginUpload(const RenderToken& token, const RenderParams& params,
-                                        const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) {
-    const Choice choice = Choose(params);
-    return choice.input->BeginUpload(token, choice.params, results, blocking, frame);
-}
-
-Status SelectInputBaseNode::FetchHostFrame(const RenderToken& token, const RenderParams& params,
-                                           const RenderResultsRef& results, bool blocking, VideoFrameRef& frame) {
-    const Choice choice = Choose(params);
-    return choice.input->FetchHostFrame(token, choice.params, results, blocking, frame);
 }
 
 Status SelectInputBaseNode::EndFrame(const RenderToken& token, const RenderParams& params,
@@ -39,12 +27,6 @@ Status SelectInputBaseNode::EndFrame(const RenderToken& token, const RenderParam
     // A second end of input 0, when that is the choice, finds nothing left to do.
     if (choice.input) choice.input->EndFrame(token, choice.params, results, level);
     return Ostrand::kStatus_OK;
-}
-
-Status SelectInputBaseNode::CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
-                                              const RenderResultsRef& previous) {
-    const Choice choice = Choose(params);
-    return choice.input->CollectHostFrames(choice.params, results, previous);
 }
 
 Status SelectInputBaseNode::Render(const RenderToken& token, const RenderParams& params,

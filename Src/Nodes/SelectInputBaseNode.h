@@ -12,20 +12,16 @@ class SelectInputBaseNode : public FilterNode {
 public:
     using FilterNode::FilterNode;
 
-    Status RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) override;
     Status CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) override;
-    Status BeginUpload(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
-                       bool blocking, VideoFrameRef& frame) override;
-    Status FetchHostFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
-                          bool blocking, VideoFrameRef& frame) override;
     Status EndFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                     std::uint32_t level) override;
-    Status CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
-                             const RenderResultsRef& previous) override;
     Status Render(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results) override;
 
     /// Reads only `params` and what Configure stored; any thread of any phase. `input` may stay empty.
     virtual void SelectInput(RenderParams& out, const RenderParams& params, RenderNodeRef& input) = 0;
+
+protected:
+    Status WalkPhase(const RenderParams& params, const InputCall& call) override;
 
 private:
     struct Choice {

@@ -12,30 +12,8 @@ RenderParams Base::Transformed(const RenderParams& params, std::size_t index) {
     return transformed;
 }
 
-Status Base::RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) {
-    return WalkInputs([&](IRenderNode& input, std::size_t index) {
-        return input.RequestHostFrames(Transformed(params, index), results);
-    });
-}
-
-Status Base::CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) {
-    VisitInputs(
-        [&](IRenderNode& input, std::size_t index) { input.CancelHostFrames(Transformed(params, index), results); });
-    return Ostrand::kStatus_OK;
-}
-
-Status Base::BeginUpload(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
-                         bool blocking, VideoFrameRef& frame) {
-    return WalkInputs([&](IRenderNode& input, std::size_t index) {
-        return input.BeginUpload(token, Transformed(params, index), results, blocking, frame);
-    });
-}
-
-Status Base::FetchHostFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
-                            bool blocking, VideoFrameRef& frame) {
-    return WalkInputs([&](IRenderNode& input, std::size_t index) {
-        return input.FetchHostFrame(token, Transformed(params, index), results, blocking, frame);
-    });
+Status Base::WalkPhase(const RenderParams& params, const InputCall& call) {
+    return WalkInputs([&](IRenderNode& input, std::size_t index) { return call(input, Transformed(params, index)); });
 }
 
 Status Base::RenderFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
@@ -51,13 +29,6 @@ Status Base::EndFrame(const RenderToken& token, const RenderParams& params, cons
         input.EndFrame(token, Transformed(params, index), results, level);
     });
     return Ostrand::kStatus_OK;
-}
-
-Status Base::CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
-                               const RenderResultsRef& previous) {
-    return WalkInputs([&](IRenderNode& input, std::size_t index) {
-        return input.CollectHostFrames(Transformed(params, index), results, previous);
-    });
 }
 
 }  // namespace Vantrel

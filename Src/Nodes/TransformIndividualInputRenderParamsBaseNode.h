@@ -12,21 +12,16 @@ class TransformIndividualInputRenderParamsBaseNode : public FilterNode {
 public:
     using FilterNode::FilterNode;
 
-    Status RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) override;
-    Status CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) override;
-    Status BeginUpload(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
-                       bool blocking, VideoFrameRef& frame) override;
-    Status FetchHostFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
-                          bool blocking, VideoFrameRef& frame) override;
     Status RenderFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                        VideoFrameRef& frame) override;
     Status EndFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                     std::uint32_t level) override;
-    Status CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
-                             const RenderResultsRef& previous) override;
 
     /// Reads only `params` and what Configure stored; any thread of any phase.
     virtual void TransformParamsForInput(RenderParams& out, const RenderParams& params, std::size_t index) = 0;
+
+protected:
+    Status WalkPhase(const RenderParams& params, const InputCall& call) override;
 
 private:
     [[nodiscard]] RenderParams Transformed(const RenderParams& params, std::size_t index);

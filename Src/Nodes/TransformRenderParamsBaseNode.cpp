@@ -10,24 +10,8 @@ RenderParams TransformRenderParamsBaseNode::Transformed(const RenderParams& para
     return transformed;
 }
 
-Status TransformRenderParamsBaseNode::RequestHostFrames(const RenderParams& params, const RenderResultsRef& results) {
-    return RenderNodeBase::RequestHostFrames(Transformed(params), results);
-}
-
-Status TransformRenderParamsBaseNode::CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) {
-    return RenderNodeBase::CancelHostFrames(Transformed(params), results);
-}
-
-Status TransformRenderParamsBaseNode::BeginUpload(const RenderToken& token, const RenderParams& params,
-                                                  const RenderResultsRef& results, bool blocking,
-                                                  VideoFrameRef& frame) {
-    return RenderNodeBase::BeginUpload(token, Transformed(params), results, blocking, frame);
-}
-
-Status TransformRenderParamsBaseNode::FetchHostFrame(const RenderToken& token, const RenderParams& params,
-                                                     const RenderResultsRef& results, bool blocking,
-                                                     VideoFrameRef& frame) {
-    return RenderNodeBase::FetchHostFrame(token, Transformed(params), results, blocking, frame);
+Status TransformRenderParamsBaseNode::WalkPhase(const RenderParams& params, const InputCall& call) {
+    return RenderNodeBase::WalkPhase(Transformed(params), call);
 }
 
 Status TransformRenderParamsBaseNode::RenderFrame(const RenderToken& token, const RenderParams& params,
@@ -38,11 +22,6 @@ Status TransformRenderParamsBaseNode::RenderFrame(const RenderToken& token, cons
 Status TransformRenderParamsBaseNode::EndFrame(const RenderToken& token, const RenderParams& params,
                                                const RenderResultsRef& results, std::uint32_t level) {
     return FilterNode::EndFrame(token, Transformed(params), results, level);
-}
-
-Status TransformRenderParamsBaseNode::CollectHostFrames(const RenderParams& params, const RenderResultsRef& results,
-                                                        const RenderResultsRef& previous) {
-    return RenderNodeBase::CollectHostFrames(Transformed(params), results, previous);
 }
 
 Guid TransformRenderParamsBaseNode::GetFrameHash(const RenderParams& params, const RenderResultsRef& results) {
