@@ -74,14 +74,10 @@ TEST_P(CompositorDevice, ASingleLayerThatFillsTheFrameIsHandedOn) {
         EXPECT_NE(Render(*Composite({Layer(leaf)})), leaf->frame);
     }
     script.ResetEffects();
+    SetOpacity({{0, 99.9995F}});
+    EXPECT_EQ(Render(*Composite({Layer(leaf)})), leaf->frame) << "almost full is full";
     script.params.pixelAspectRatio = {2, 1};
     EXPECT_NE(Render(*Composite({leaf})), leaf->frame);
-}
-
-TEST_P(CompositorDevice, AlmostFullOpacityIsFull) {
-    const FrameLeafRef leaf = Leaf(kRed);
-    SetOpacity({{0, 99.9995F}});
-    EXPECT_EQ(Render(*Composite({Layer(leaf)})), leaf->frame);
 }
 
 TEST_P(CompositorDevice, TheBottomLayerHasNoBlendModeAndThenNoOpacity) {
@@ -177,9 +173,12 @@ TEST_P(CompositorDevice, ALayerThatRunsOutOfMemoryGetsASecondTry) {
 
 class IntrinsicDevice : public CompositorDevice {};
 
-TEST_P(IntrinsicDevice, IdentityHandsThePictureOn) {
+TEST_P(IntrinsicDevice, WhatChangesNothingHandsThePictureOn) {
     const FrameLeafRef leaf = Leaf(kRed);
     EXPECT_EQ(Render(*Layer(leaf)), leaf->frame);
+    NewRequest();
+    SetOpacity({{0, 20.0F}, {1, std::int32_t{Kiln::kBlend_Screen}}});
+    EXPECT_EQ(Render(*Layer(leaf)), leaf->frame) << "a blend mode takes the opacity with it";
 }
 
 TEST_P(IntrinsicDevice, TheUpperEffectDoesTheWorkOfBoth) {
@@ -197,12 +196,6 @@ TEST_P(IntrinsicDevice, TheUpperEffectDoesTheWorkOfBoth) {
     ExpectPixel(PixelOf(Render(*Layer(Leaf(kRed), true, false)), 4, 4), {0.0, 0.0, 1.0, 0.5});
     NewRequest();
     ExpectPixel(PixelOf(Render(*Layer(Leaf(kRed), false, true)), 32, 18), kRed);
-}
-
-TEST_P(IntrinsicDevice, ABlendModeTakesTheOpacityWithIt) {
-    const FrameLeafRef leaf = Leaf(kRed);
-    SetOpacity({{0, 20.0F}, {1, std::int32_t{Kiln::kBlend_Screen}}});
-    EXPECT_EQ(Render(*Layer(leaf)), leaf->frame);
 }
 
 TEST_P(IntrinsicDevice, TheFingerprintFollowsTheMotion) {

@@ -52,22 +52,6 @@ TEST_F(HostRender, AFrameIsRequestedOnceAndArrivesLater) {
     EXPECT_FALSE(results->HasFailed());
 }
 
-TEST_F(HostRender, CallbacksMayComeFromAnyThreadOrWithinTheCall) {
-    const ClipNodeRef clip = MakeClip();
-    EXPECT_EQ(Request(*clip), 0) << "delivered within the call";
-    EXPECT_TRUE(Fetch(*clip));
-
-    host.renderer.delivery = Delivery::kOnAThread;
-    std::atomic<bool> complete{false};
-    results = boost::make_shared<RenderResults>([&] { complete = true; }, 1);
-    for (script.params.clipTime = 0; script.params.clipTime < 20; ++script.params.clipTime) {
-        EXPECT_EQ(Request(*clip), 0);
-    }
-    results->EndAsyncPiece();
-    while (!complete) std::this_thread::yield();
-    for (script.params.clipTime = 0; script.params.clipTime < 20; ++script.params.clipTime) EXPECT_TRUE(Fetch(*clip));
-}
-
 TEST_F(HostRender, ARenderThatDeliversNothingFailsTheRequest) {
     host.renderer.callbackStatus = -1;
     const ClipNodeRef clip = MakeClip();
@@ -211,12 +195,6 @@ TEST_F(HostRender, SubtreesAreRenderedAsNodesAndEffectsAsOperators) {
     EXPECT_EQ(renders[1].nodeTime, 2000) << "the host maps it itself";
     EXPECT_TRUE(Fetch(*media));
     EXPECT_TRUE(Fetch(*effect));
-
-    // A picture of the host and a node's own never share a fingerprint.
-    const std::string text = MediaScript::Media()->GetHash().ToString();
-    host.nodes[MediaScript::kMedia].frameHashText = text;
-    results = MediaScript::MakeResults();
-    EXPECT_NE(media->GetFrameHash(script.params, results), Guid(text));
 }
 
 TEST_F(HostRender, TheSubtreeNodeTellsWhatComesFromTheHost) {

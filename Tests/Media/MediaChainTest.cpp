@@ -176,6 +176,9 @@ TEST_F(MediaChain, LetsTheHostReduceALargeStreamAtLowQuality) {
     };
     EXPECT_TRUE(usesHost());
     EXPECT_EQ(Select(*media).outputRect, Vellum::Rect({0, 0, 64, 36})) << "params go down as they came";
+    EXPECT_EQ(media->RequestHostFrames(script.params, MediaScript::MakeResults()), 0);
+    EXPECT_EQ(host.Count("RenderNode"), 1);
+    EXPECT_EQ(host.Count("RenderClip"), 0);
     script.params.quality = 3;
     EXPECT_FALSE(usesHost());
     script.params.quality = 2;

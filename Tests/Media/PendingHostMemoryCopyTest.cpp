@@ -178,17 +178,6 @@ TEST_F(PendingCopies, ARequestWhoseOwnCopyFailedStillGetsThatOfAnother) {
     EXPECT_EQ(early->FindFrame(kHash), mMade);
 }
 
-TEST_F(PendingCopies, TheLastPieceRunsTheCompletionOnce) {
-    int completions = 0;
-    const auto results = boost::make_shared<RenderResults>([&] { ++completions; }, 1);
-    EXPECT_FALSE(GetOrClaim(results, false));
-    Queue();
-    results->EndAsyncPiece();  // the walk that staged it
-    EXPECT_EQ(completions, 0);
-    mExecutor->Drain();
-    EXPECT_EQ(completions, 1);
-}
-
 TEST_F(PendingCopies, AnEntryWithoutAFunctionRaises) {
     const RenderResultsRef results = MakeResults();
     EXPECT_FALSE(GetOrClaim(results, false));

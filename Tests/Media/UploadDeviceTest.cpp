@@ -327,23 +327,6 @@ TEST_P(UploadDevice, BlendedFramesWeighColorByAlpha) {
     EXPECT_NEAR(woven.Get(7, 1)[3], 1.0, 1e-3);
 }
 
-TEST_P(UploadDevice, TheHostReducesWhatIsWantedSmall) {
-    script.Set({{"MediaNode::StreamFrameWidth", "256"}, {"MediaNode::StreamFrameHeight", "144"}});
-    host.clips[MediaScript::kClipID].deliver = [](VantrelClipRecord wanted) {
-        wanted.width = 256;
-        wanted.height = 144;
-        return wanted;
-    };
-    script.params.sequenceRect = {0, 0, 256, 144};
-    script.Output(64, 36);
-    ShowColor({10, 20, 30, 255});
-    const VideoFrameRef frame = Play(*MakeMedia<ClipMedia>());
-    EXPECT_EQ(frame->GetBounds(), Vellum::Rect({0, 0, 64, 36}));
-    EXPECT_EQ(host.Count("RenderClip"), 0);
-    EXPECT_EQ(host.Count("RenderNode"), 1);
-    ExpectPixel(frame, {10 / 255.0, 20 / 255.0, 30 / 255.0, 1.0});
-}
-
 TEST_P(UploadDevice, TimingsNameTheSourceAndTheStages) {
     const auto upload = MakeMedia<Subtree>();
     static_cast<void>(Play(*upload));
