@@ -50,6 +50,8 @@ struct Driver {
     Driver();
 };
 [[nodiscard]] const Driver& Api();
+/// A call of the driver that must succeed.
+#define CHECK_CUDA(...) EXPECT_EQ(Api().__VA_ARGS__, CUDA_SUCCESS)
 
 /// The CPU image of the module under this key.
 [[nodiscard]] const void* FindImage(const std::string& key);
@@ -124,6 +126,11 @@ protected:
     /// Launches over width by height threads in blocks of 16 by 16.
     CUresult Launch(const char* kernel, int width, int height, const Arguments& arguments,
                     CUstream stream = nullptr) const;
+    /// A launch that must succeed.
+    void Run(const char* kernel, int width, int height, const Arguments& arguments, CUstream stream = nullptr) const {
+        EXPECT_EQ(Launch(kernel, width, height, arguments, stream), CUDA_SUCCESS)
+            << kernel << ": " << Api().SoftCudaGetMessage();
+    }
     void Synchronize() const { EXPECT_EQ(Api().cuCtxSynchronize(), CUDA_SUCCESS); }
 
     CUcontext mContext = nullptr;

@@ -51,7 +51,7 @@ protected:
         const float t = static_cast<float>(random() % 100) * 0.01F;
         const int w = a.width, h = a.height, f = a.format;
         const auto launch = [&](const char* kernel, const Arguments& arguments) {
-            EXPECT_EQ(Launch(kernel, w, h, arguments, stream), CUDA_SUCCESS) << kernel << Api().SoftCudaGetMessage();
+            Run(kernel, w, h, arguments, stream);
         };
         switch (random() % 9) {
             case 0:
@@ -82,10 +82,10 @@ protected:
         std::mt19937 random(seed);
         table.Write(RandomPixels(64, random));
         CUstream stream = nullptr;
-        EXPECT_EQ(Api().cuStreamCreate(&stream, 0), CUDA_SUCCESS);
+        CHECK_CUDA(cuStreamCreate(&stream, 0));
         const int links = 2 + static_cast<int>(random() % 12);
         for (int i = 0; i < links; ++i) LaunchRandom(frames, table.data, random, stream);
-        EXPECT_EQ(Api().cuStreamDestroy_v2(stream), CUDA_SUCCESS);
+        CHECK_CUDA(cuStreamDestroy_v2(stream));
         std::vector<std::vector<unsigned char>> bytes;
         for (const auto& frame : frames) bytes.push_back(frame->ReadBytes());
         return bytes;
@@ -124,19 +124,19 @@ TEST_F(FusionTest, AChainInPlaceTakesOnePassAndAnythingElseEndsIt) {
     DeviceFrame frame(64, 64, 64, 1);
     frame.Write(std::vector<Pixel>(64 * 64, Pixel{{1.0F, 1.0F, 1.0F, 1.0F}}));
     CUstream stream = nullptr;
-    ASSERT_EQ(Api().cuStreamCreate(&stream, 0), CUDA_SUCCESS);
+    CHECK_CUDA(cuStreamCreate(&stream, 0));
     const Arguments twice(frame.data, 64, 1, 64, 64, 2.0F, 0.0F);
     // Work in front keeps the stream busy until all are queued.
     const auto queue = [&](bool fillBetween) {
         Api().cuMemsetD8_v2(frame.data, 0, 0);
         for (int i = 0; i < 6; ++i) {
-            EXPECT_EQ(Launch("GainKernel", 64, 64, twice, stream), CUDA_SUCCESS);
+            Run("GainKernel", 64, 64, twice, stream);
             if (fillBetween && i == 2) {
                 const CUdeviceptr row = frame.data + 16 * 64;
-                EXPECT_EQ(Api().cuMemcpyDtoDAsync_v2(row, frame.data, 16 * 64, stream), CUDA_SUCCESS);
+                CHECK_CUDA(cuMemcpyDtoDAsync_v2(row, frame.data, 16 * 64, stream));
             }
         }
-        EXPECT_EQ(Api().cuStreamSynchronize(stream), CUDA_SUCCESS);
+        CHECK_CUDA(cuStreamSynchronize(stream));
     };
     const SoftCudaCounters before = ReadCounters();
     queue(false);
@@ -147,7 +147,7 @@ TEST_F(FusionTest, AChainInPlaceTakesOnePassAndAnythingElseEndsIt) {
 
     queue(true);
     EXPECT_EQ(frame.Read()[65].value[0], 4096.0F);
-    EXPECT_EQ(Api().cuStreamDestroy_v2(stream), CUDA_SUCCESS);
+    CHECK_CUDA(cuStreamDestroy_v2(stream));
 }
 
 TEST_F(FusionTest, RecordsAndMarksMayComeBetweenLaunchesOfOnePass) {
@@ -156,64 +156,61 @@ TEST_F(FusionTest, RecordsAndMarksMayComeBetweenLaunchesOfOnePass) {
     CUmodule second = nullptr;
     CUdeviceptr offsets = 0, unrelated = 0;
     std::size_t bytes = 0;
-    ASSERT_EQ(Api().cuModuleLoadData(&second, FindImage("TestKernels")), CUDA_SUCCESS);
-    ASSERT_EQ(Api().cuModuleGetGlobal_v2(&offsets, &bytes, mModule, "offsets"), CUDA_SUCCESS);
-    ASSERT_EQ(Api().cuModuleGetGlobal_v2(&unrelated, &bytes, second, "offsets"), CUDA_SUCCESS);
+    CHECK_CUDA(cuModuleLoadData(&second, FindImage("TestKernels")));
+    CHECK_CUDA(cuModuleGetGlobal_v2(&offsets, &bytes, mModule, "offsets"));
+    CHECK_CUDA(cuModuleGetGlobal_v2(&unrelated, &bytes, second, "offsets"));
     CUstream stream = nullptr;
     CUevent marks[3] = {};
-    ASSERT_EQ(Api().cuStreamCreate(&stream, CU_STREAM_NON_BLOCKING), CUDA_SUCCESS);
-    for (CUevent& mark : marks) ASSERT_EQ(Api().cuEventCreate(&mark, 0), CUDA_SUCCESS);
+    CHECK_CUDA(cuStreamCreate(&stream, CU_STREAM_NON_BLOCKING));
+    for (CUevent& mark : marks) CHECK_CUDA(cuEventCreate(&mark, 0));
 
     // Each round: offset, gain, offset, with a record written in between; the sum tells their order.
     const auto run = [&](CUdeviceptr record) {
         frame.Write(std::vector<Pixel>(kSize * kSize, Pixel{}));
         float values[5] = {1, 0, 0, 0, 0};
-        EXPECT_EQ(Api().cuMemcpyHtoD_v2(offsets, values, sizeof values), CUDA_SUCCESS);
+        CHECK_CUDA(cuMemcpyHtoD_v2(offsets, values, sizeof values));
         // A large copy in front lets all that follows queue up behind it.
         for (int i = 0; i < 20; ++i)
-            EXPECT_EQ(Api().cuMemcpyDtoDAsync_v2(other.data, frame.data, kSize * kSize * 16, stream), CUDA_SUCCESS);
+            CHECK_CUDA(cuMemcpyDtoDAsync_v2(other.data, frame.data, kSize * kSize * 16, stream));
         const SoftCudaCounters before = ReadCounters();
-        EXPECT_EQ(Api().cuEventRecord(marks[0], stream), CUDA_SUCCESS);
+        CHECK_CUDA(cuEventRecord(marks[0], stream));
         const Arguments add(frame.data, kSize, 1, kSize, kSize, 0, CUdeviceptr{0});
-        EXPECT_EQ(Launch("OffsetKernel", kSize, kSize, add, stream), CUDA_SUCCESS);
+        Run("OffsetKernel", kSize, kSize, add, stream);
         values[0] = 5;
-        EXPECT_EQ(Api().cuMemcpyHtoDAsync_v2(record, values, sizeof values, stream), CUDA_SUCCESS);
+        CHECK_CUDA(cuMemcpyHtoDAsync_v2(record, values, sizeof values, stream));
         values[0] = 1000;  // pageable memory has been taken
-        EXPECT_EQ(
-            Launch("GainKernel", kSize, kSize, Arguments(frame.data, kSize, 1, kSize, kSize, 10.0F, 0.0F), stream),
-            CUDA_SUCCESS);
-        EXPECT_EQ(Api().cuEventRecord(marks[1], stream), CUDA_SUCCESS);
-        EXPECT_EQ(Launch("OffsetKernel", kSize, kSize, add, stream), CUDA_SUCCESS);
-        EXPECT_EQ(Api().cuEventRecord(marks[2], stream), CUDA_SUCCESS);
-        EXPECT_EQ(Api().cuStreamSynchronize(stream), CUDA_SUCCESS);
+        Run("GainKernel", kSize, kSize, Arguments(frame.data, kSize, 1, kSize, kSize, 10.0F, 0.0F), stream);
+        CHECK_CUDA(cuEventRecord(marks[1], stream));
+        Run("OffsetKernel", kSize, kSize, add, stream);
+        CHECK_CUDA(cuEventRecord(marks[2], stream));
+        CHECK_CUDA(cuStreamSynchronize(stream));
         EXPECT_EQ(frame.Read()[kSize * kSize - 1].value[2], record == offsets ? 15.0F : 11.0F);
         return ReadCounters().fused - before.fused;
     };
     EXPECT_EQ(run(unrelated), 2U);
     // The times of marks within a pass grow in their order.
     float first = -1, last = -1;
-    EXPECT_EQ(Api().cuEventElapsedTime(&first, marks[0], marks[1]), CUDA_SUCCESS);
-    EXPECT_EQ(Api().cuEventElapsedTime(&last, marks[1], marks[2]), CUDA_SUCCESS);
+    CHECK_CUDA(cuEventElapsedTime(&first, marks[0], marks[1]));
+    CHECK_CUDA(cuEventElapsedTime(&last, marks[1], marks[2]));
     EXPECT_GT(first, 0);
     EXPECT_GT(last, 0);
     EXPECT_EQ(run(offsets), 1U);
-    for (CUevent mark : marks) EXPECT_EQ(Api().cuEventDestroy_v2(mark), CUDA_SUCCESS);
-    EXPECT_EQ(Api().cuStreamDestroy_v2(stream), CUDA_SUCCESS);
+    for (CUevent mark : marks) CHECK_CUDA(cuEventDestroy_v2(mark));
+    CHECK_CUDA(cuStreamDestroy_v2(stream));
 }
 
 TEST_F(FusionTest, ALoneLaunchBeginsByItself) {
     DeviceFrame frame(32, 32, 32, 1);
     CUstream stream = nullptr;
-    ASSERT_EQ(Api().cuStreamCreate(&stream, 0), CUDA_SUCCESS);
+    CHECK_CUDA(cuStreamCreate(&stream, 0));
     const SoftCudaCounters before = ReadCounters();
-    ASSERT_EQ(Launch("RampKernel", 32, 32, Arguments(frame.data, 32, 1, 32, 32, Pixel{{1, 1, 1, 1}}), stream),
-              CUDA_SUCCESS);
+    Run("RampKernel", 32, 32, Arguments(frame.data, 32, 1, 32, 32, Pixel{{1, 1, 1, 1}}), stream);
     // Nobody waits for it: only the driver's own clock can end the wait for a companion.
     for (int i = 0; i < 10000 && Api().cuStreamQuery(stream) == CUDA_ERROR_NOT_READY; ++i)
         std::this_thread::sleep_for(std::chrono::milliseconds(1));
-    EXPECT_EQ(Api().cuStreamQuery(stream), CUDA_SUCCESS);
+    CHECK_CUDA(cuStreamQuery(stream));
     EXPECT_EQ(ReadCounters().timerFlushes - before.timerFlushes, 1U);
-    EXPECT_EQ(Api().cuStreamDestroy_v2(stream), CUDA_SUCCESS);
+    CHECK_CUDA(cuStreamDestroy_v2(stream));
 }
 
 }  // namespace SoftCudaTest

@@ -63,9 +63,8 @@ TEST_P(KernelTest, PointwiseKernelsMatchPlainLoopsAndLeaveTheRestAlone) {
         in.Write(RandomPixels(static_cast<std::size_t>(width * height), mRandom));
         const std::vector<Pixel> source = in.Read();
         const auto at = [&](int x, int y, int c) { return source[static_cast<std::size_t>(y * width + x)].value[c]; };
-        ASSERT_EQ(Launch("InvertKernel", width, height,
-                         Arguments(format, out.data, width, height, out.pitch, in.data, in.pitch, 0.25F)),
-                  CUDA_SUCCESS);
+        Run("InvertKernel", width, height,
+            Arguments(format, out.data, width, height, out.pitch, in.data, in.pitch, 0.25F));
         const auto expected = MakePixels(width, height, format, [&](int x, int y, int c) {
             const double value = at(x, y, c);
             return c == 3 ? value : (1.0 - value) * 0.75 + value * 0.25;
@@ -79,9 +78,8 @@ TEST_P(KernelTest, PointwiseKernelsMatchPlainLoopsAndLeaveTheRestAlone) {
             EXPECT_TRUE(std::all_of(padding, padding + 2 * pixel, [](unsigned char byte) { return byte == 0x5A; }));
         }
 
-        ASSERT_EQ(Launch("RampKernel", width, height,
-                         Arguments(out.data, out.pitch, format, width, height, Pixel{{0.5F, 2.0F, -1.0F, 0.5F}})),
-                  CUDA_SUCCESS);
+        Run("RampKernel", width, height,
+            Arguments(out.data, out.pitch, format, width, height, Pixel{{0.5F, 2.0F, -1.0F, 0.5F}}));
         ExpectNear(out.Read(),
                    MakePixels(width, height, format,
                               [](int x, int y, int c) {
@@ -103,10 +101,9 @@ TEST_P(KernelTest, CopyingKeepsEveryHalfAndEveryFloat) {
     }
     in.WriteBytes(bytes);
     const auto copy = [&](const DeviceFrame& target, const DeviceFrame& source) {
-        ASSERT_EQ(Launch("CopyKernel", source.width, source.height,
-                         Arguments(source.format, target.data, source.width, source.height, target.pitch, source.data,
-                                   source.pitch)),
-                  CUDA_SUCCESS);
+        Run("CopyKernel", source.width, source.height,
+            Arguments(source.format, target.data, source.width, source.height, target.pitch, source.data,
+                      source.pitch));
     };
     copy(out, in);
     EXPECT_EQ(out.ReadBytes(), bytes);
@@ -129,17 +126,14 @@ TEST_P(KernelTest, GatherKernelsMatchPlainLoops) {
             const int column = std::clamp(x, 0, width - 1), row = std::clamp(y, 0, height - 1);
             return static_cast<double>(source[static_cast<std::size_t>(row * width + column)].value[c]);
         };
-        ASSERT_EQ(Launch("ShiftKernel", width, height,
-                         Arguments(format, in.data, in.pitch, out.data, out.pitch, width, height, -3.25F)),
-                  CUDA_SUCCESS);
+        Run("ShiftKernel", width, height,
+            Arguments(format, in.data, in.pitch, out.data, out.pitch, width, height, -3.25F));
         ExpectNear(out.Read(),
                    MakePixels(width, height, format,
                               [&](int x, int y, int c) { return at(x - 4, y, c) * 0.25 + at(x - 3, y, c) * 0.75; }),
                    GetRelative(format), 1e-6, width);
 
-        ASSERT_EQ(Launch("SmoothKernel", width, height,
-                         Arguments(format, in.data, in.pitch, out.data, out.pitch, width, height)),
-                  CUDA_SUCCESS);
+        Run("SmoothKernel", width, height, Arguments(format, in.data, in.pitch, out.data, out.pitch, width, height));
         ExpectNear(out.Read(),
                    MakePixels(width, height, format,
                               [&](int x, int y, int c) {
@@ -158,7 +152,7 @@ TEST_P(KernelTest, PassesDownTheColumnsMatchPlainLoops) {
     float factor = 0.75F;
     CUdeviceptr source = in.data, target = out.data;
     void* parameters[] = {&source, &target, &pitch, &columns, &rows, &factor};
-    ASSERT_EQ(Api().cuLaunchKernel(function, 1, 1, 1, 128, 1, 1, 0, nullptr, parameters, nullptr), CUDA_SUCCESS);
+    CHECK_CUDA(cuLaunchKernel(function, 1, 1, 1, 128, 1, 1, 0, nullptr, parameters, nullptr));
     const auto values = in.Read(), results = out.Read();
     for (int x = 0; x < kPitch; ++x) {
         double state = 0;
@@ -177,40 +171,36 @@ TEST_P(KernelTest, BytesGoThroughFramesUnchanged) {
     std::vector<unsigned char> bytes(kWidth * kHeight * 4);
     for (std::size_t i = 0; i < bytes.size(); ++i) bytes[i] = static_cast<unsigned char>(i * 7 + i / 256);
     CUdeviceptr packed = 0;
-    ASSERT_EQ(Api().cuMemAlloc_v2(&packed, bytes.size()), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemAlloc_v2(&packed, bytes.size()));
     for (int format = 0; format < 2; ++format) {
         DeviceFrame frame(kWidth, kHeight, kWidth + 3, format);
-        ASSERT_EQ(Api().cuMemcpyHtoD_v2(packed, bytes.data(), bytes.size()), CUDA_SUCCESS);
-        ASSERT_EQ(Launch("UnpackKernel", kWidth, kHeight,
-                         Arguments(packed, kWidth, frame.data, frame.pitch, format, kWidth, kHeight)),
-                  CUDA_SUCCESS);
+        CHECK_CUDA(cuMemcpyHtoD_v2(packed, bytes.data(), bytes.size()));
+        Run("UnpackKernel", kWidth, kHeight,
+            Arguments(packed, kWidth, frame.data, frame.pitch, format, kWidth, kHeight));
         EXPECT_NEAR(frame.Read()[1].value[0], bytes[4] / 255.0, 1e-3);
-        ASSERT_EQ(Api().cuMemsetD8_v2(packed, 0, bytes.size()), CUDA_SUCCESS);
-        ASSERT_EQ(Launch("PackKernel", kWidth, kHeight,
-                         Arguments(frame.data, frame.pitch, format, packed, kWidth, kWidth, kHeight)),
-                  CUDA_SUCCESS);
+        CHECK_CUDA(cuMemsetD8_v2(packed, 0, bytes.size()));
+        Run("PackKernel", kWidth, kHeight, Arguments(frame.data, frame.pitch, format, packed, kWidth, kWidth, kHeight));
         std::vector<unsigned char> back(bytes.size());
-        ASSERT_EQ(Api().cuMemcpyDtoH_v2(back.data(), packed, back.size()), CUDA_SUCCESS);
+        CHECK_CUDA(cuMemcpyDtoH_v2(back.data(), packed, back.size()));
         EXPECT_EQ(back, bytes);
     }
-    EXPECT_EQ(Api().cuMemFree_v2(packed), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemFree_v2(packed));
 }
 
 /// The functions of a device file at work, against the C library in double precision.
 class MathTest : public KernelTest {
 protected:
-    std::vector<float> Run(int function, const std::vector<float>& a, const std::vector<float>& b) const {
+    std::vector<float> Evaluate(int function, const std::vector<float>& a, const std::vector<float>& b) const {
         const std::size_t bytes = a.size() * sizeof(float);
         CUdeviceptr memory[3] = {};
-        for (CUdeviceptr& block : memory) EXPECT_EQ(Api().cuMemAlloc_v2(&block, bytes), CUDA_SUCCESS);
-        EXPECT_EQ(Api().cuMemcpyHtoD_v2(memory[0], a.data(), bytes), CUDA_SUCCESS);
-        EXPECT_EQ(Api().cuMemcpyHtoD_v2(memory[1], b.data(), bytes), CUDA_SUCCESS);
+        for (CUdeviceptr& block : memory) CHECK_CUDA(cuMemAlloc_v2(&block, bytes));
+        CHECK_CUDA(cuMemcpyHtoD_v2(memory[0], a.data(), bytes));
+        CHECK_CUDA(cuMemcpyHtoD_v2(memory[1], b.data(), bytes));
         const int count = static_cast<int>(a.size());
-        EXPECT_EQ(Launch("MathKernel", count, 1, Arguments(function, memory[0], memory[1], memory[2], count)),
-                  CUDA_SUCCESS);
+        Run("MathKernel", count, 1, Arguments(function, memory[0], memory[1], memory[2], count));
         std::vector<float> out(a.size());
-        EXPECT_EQ(Api().cuMemcpyDtoH_v2(out.data(), memory[2], bytes), CUDA_SUCCESS);
-        for (const CUdeviceptr block : memory) EXPECT_EQ(Api().cuMemFree_v2(block), CUDA_SUCCESS);
+        CHECK_CUDA(cuMemcpyDtoH_v2(out.data(), memory[2], bytes));
+        for (const CUdeviceptr block : memory) CHECK_CUDA(cuMemFree_v2(block));
         return out;
     }
 };
@@ -241,7 +231,7 @@ TEST_P(MathTest, FunctionsStayWithinTheirStatedErrors) {
         std::vector<float> a(20000), b(a.size());
         for (float& value : a) value = da(mRandom);
         for (float& value : b) value = db(mRandom);
-        const std::vector<float> out = Run(each.function, a, b);
+        const std::vector<float> out = Evaluate(each.function, a, b);
         double worst = 0;
         std::size_t where = 0;
         for (std::size_t i = 0; i < a.size(); ++i) {
@@ -259,38 +249,36 @@ TEST_P(MathTest, EdgesAreAsWrittenDown) {
         int function;
         float a, b, result;
     };
-    const Case cases[] = {
-        {0, 128, 0, kInfinity},
-        {0, -127, 0, 0},
-        {0, 0, 0, 1},
-        {0, kNaN, 0, kNaN},
-        {1, 0, 0, -kInfinity},
-        {1, 1, 0, 0},
-        {1, kInfinity, 0, kInfinity},
-        {1, -1, 0, kNaN},
-        {2, 0, 0.5F, 0},
-        {2, -3, 2, 0},
-        {2, 0, 0, 1},
-        {2, 0, -1, kInfinity},
-        {2, 1, 77, 1},
-        {2, kNaN, 1, kNaN},
-        {5, 0, 0, 0},
-        {7, 0, 0, 0},
-        // The second operand is the result where one is not a number.
-        {8, kNaN, 3, 3},
-        {8, 3, kNaN, kNaN},
-        {9, kNaN, 3, 3},
-        {9, 3, kNaN, kNaN},
-        {8, 1, 2, 1},
-        {9, 1, 2, 2},
-        {10, kNaN, 0, 0},
-        {10, 7, 0, 1},
-        {10, -kInfinity, 0, 0},
-        {13, -1, 4, 3},
-        {13, 9, 4, 1},
-    };
+    // Of 8 and 9, minimum and maximum, the second operand is the result where one is not a number.
+    const Case cases[] = {{0, 128, 0, kInfinity},
+                          {0, -127, 0, 0},
+                          {0, 0, 0, 1},
+                          {0, kNaN, 0, kNaN},
+                          {1, 0, 0, -kInfinity},
+                          {1, 1, 0, 0},
+                          {1, kInfinity, 0, kInfinity},
+                          {1, -1, 0, kNaN},
+                          {2, 0, 0.5F, 0},
+                          {2, -3, 2, 0},
+                          {2, 0, 0, 1},
+                          {2, 0, -1, kInfinity},
+                          {2, 1, 77, 1},
+                          {2, kNaN, 1, kNaN},
+                          {5, 0, 0, 0},
+                          {7, 0, 0, 0},
+                          {8, kNaN, 3, 3},
+                          {8, 3, kNaN, kNaN},
+                          {9, kNaN, 3, 3},
+                          {9, 3, kNaN, kNaN},
+                          {8, 1, 2, 1},
+                          {9, 1, 2, 2},
+                          {10, kNaN, 0, 0},
+                          {10, 7, 0, 1},
+                          {10, -kInfinity, 0, 0},
+                          {13, -1, 4, 3},
+                          {13, 9, 4, 1}};
     for (const Case& each : cases) {
-        const float got = Run(each.function, {each.a}, {each.b})[0];
+        const float got = Evaluate(each.function, {each.a}, {each.b})[0];
         const bool same = std::isnan(each.result) ? std::isnan(got) : got == each.result;
         EXPECT_TRUE(same) << "function " << each.function << "(" << each.a << ", " << each.b << ") gave " << got;
     }
@@ -304,7 +292,7 @@ TEST_P(KernelTest, TexturesAreSampledAsTheirDescriptorSays) {
     pixels[3 * kWidth + 5] = {{9, 9, 9, 0}};  // bright, but not there: it must not bleed
     in.Write(pixels);
     CUdeviceptr descriptorMemory = 0;
-    ASSERT_EQ(Api().cuMemAlloc_v2(&descriptorMemory, sizeof(TextureDescriptor)), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemAlloc_v2(&descriptorMemory, sizeof(TextureDescriptor)));
 
     const auto index = [](int i, int size, int mode) {
         if (mode == TEXTURE_ADDRESS_CLAMP) return std::clamp(i, 0, size - 1);
@@ -317,13 +305,11 @@ TEST_P(KernelTest, TexturesAreSampledAsTheirDescriptorSays) {
         for (int filter = 0; filter < 2; ++filter) {
             SCOPED_TRACE("mode " + std::to_string(mode) + ", filter " + std::to_string(filter));
             const TextureDescriptor descriptor = {in.data, kWidth, kHeight, kWidth, 1, mode, filter};
-            ASSERT_EQ(Api().cuMemcpyHtoD_v2(descriptorMemory, &descriptor, sizeof descriptor), CUDA_SUCCESS);
+            CHECK_CUDA(cuMemcpyHtoD_v2(descriptorMemory, &descriptor, sizeof descriptor));
             const Pixel matrix{{1.5F, -0.25F, 0.125F, 1.25F}};
             const auto run = [&](const DeviceFrame& target, int lanesOff) {
-                ASSERT_EQ(
-                    Launch("SampleKernel", kWidth, kHeight,
-                           Arguments(descriptorMemory, target.data, kWidth, 1, kWidth, kHeight, matrix, lanesOff)),
-                    CUDA_SUCCESS);
+                Run("SampleKernel", kWidth, kHeight,
+                    Arguments(descriptorMemory, target.data, kWidth, 1, kWidth, kHeight, matrix, lanesOff));
             };
             run(out, 0);
             run(single, 1);
@@ -349,7 +335,7 @@ TEST_P(KernelTest, TexturesAreSampledAsTheirDescriptorSays) {
             ExpectNear(out.Read(), expected, 1e-4, 1e-4, kWidth);
             ExpectNear(single.Read(), expected, 1e-4, 1e-4, kWidth);
         }
-    EXPECT_EQ(Api().cuMemFree_v2(descriptorMemory), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemFree_v2(descriptorMemory));
 }
 
 // A level that the processor lacks runs as the best one below it.

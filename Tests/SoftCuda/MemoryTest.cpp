@@ -20,7 +20,7 @@ protected:
     }
     [[nodiscard]] static std::size_t GetFree() {
         std::size_t free = 0, total = 0;
-        EXPECT_EQ(Api().cuMemGetInfo_v2(&free, &total), CUDA_SUCCESS);
+        CHECK_CUDA(cuMemGetInfo_v2(&free, &total));
         return free;
     }
 };
@@ -28,19 +28,19 @@ protected:
 TEST_F(MemoryTest, SizeIsAsSetAndWhatGoesBeyondIsRefused) {
     Reopen(64);
     std::size_t total = 0;
-    EXPECT_EQ(Api().cuDeviceTotalMem_v2(&total, 0), CUDA_SUCCESS);
+    CHECK_CUDA(cuDeviceTotalMem_v2(&total, 0));
     EXPECT_EQ(total, 64U << 20);
     EXPECT_EQ(GetFree(), total);
 
     CUdeviceptr first = 0, second = 0;
-    ASSERT_EQ(Api().cuMemAlloc_v2(&first, 40U << 20), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemAlloc_v2(&first, 40U << 20));
     EXPECT_EQ(first % (2U << 20), 0U);
     EXPECT_EQ(GetFree(), 24U << 20);
     EXPECT_EQ(Api().cuMemAlloc_v2(&second, 25U << 20), CUDA_ERROR_OUT_OF_MEMORY);
     EXPECT_NE(std::string(Api().SoftCudaGetMessage()).find("device memory"), std::string::npos);
-    EXPECT_EQ(Api().cuMemFree_v2(first), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemFree_v2(first));
     EXPECT_EQ(Api().cuMemFree_v2(first), CUDA_ERROR_INVALID_VALUE);
-    EXPECT_EQ(Api().cuMemAlloc_v2(&second, 64U << 20), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemAlloc_v2(&second, 64U << 20));
     EXPECT_EQ(Api().cuMemAlloc_v2(&first, 0), CUDA_ERROR_INVALID_VALUE);
 
     // What a context leaves behind goes with it.
@@ -58,7 +58,7 @@ TEST_F(MemoryTest, FailuresComeAsOftenAsAskedFor) {
         CUdeviceptr block = 0;
         results.push_back(Api().cuMemAlloc_v2(&block, 4096));
         if (block != 0) {
-            EXPECT_EQ(Api().cuMemFree_v2(block), CUDA_SUCCESS);
+            CHECK_CUDA(cuMemFree_v2(block));
         }
     }
     Api().SoftCudaSetFailEvery(0);
@@ -69,15 +69,15 @@ TEST_F(MemoryTest, FailuresComeAsOftenAsAskedFor) {
 TEST_F(MemoryTest, AddressesLeadToTheirBlock) {
     CUdeviceptr block = 0, base = 0;
     std::size_t pitch = 0, bytes = 0;
-    ASSERT_EQ(Api().cuMemAllocPitch_v2(&block, &pitch, 1000, 30, 16), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemAllocPitch_v2(&block, &pitch, 1000, 30, 16));
     EXPECT_GE(pitch, 1000U);
     EXPECT_EQ(pitch % 16, 0U);
-    EXPECT_EQ(Api().cuMemGetAddressRange_v2(&base, &bytes, block + 5000), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemGetAddressRange_v2(&base, &bytes, block + 5000));
     EXPECT_EQ(base, block);
     EXPECT_EQ(bytes, pitch * 30);
     EXPECT_EQ(Api().cuMemGetAddressRange_v2(&base, &bytes, block + pitch * 30), CUDA_ERROR_NOT_FOUND);
     EXPECT_EQ(Api().cuMemcpyHtoD_v2(block + pitch * 30 - 4, &bytes, 8), CUDA_ERROR_INVALID_VALUE);
-    EXPECT_EQ(Api().cuMemFree_v2(block), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemFree_v2(block));
 }
 
 TEST_F(MemoryTest, CopiesOfRowsReachExactlyTheirRectangle) {
@@ -85,9 +85,9 @@ TEST_F(MemoryTest, CopiesOfRowsReachExactlyTheirRectangle) {
     std::vector<unsigned char> source(kPitch * kRows), result(kPitch * kRows);
     std::iota(source.begin(), source.end(), static_cast<unsigned char>(3));
     CUdeviceptr from = 0, to = 0;
-    ASSERT_EQ(Api().cuMemAlloc_v2(&from, source.size()), CUDA_SUCCESS);
-    ASSERT_EQ(Api().cuMemAlloc_v2(&to, source.size()), CUDA_SUCCESS);
-    ASSERT_EQ(Api().cuMemsetD8_v2(to, 0xEE, source.size()), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemAlloc_v2(&from, source.size()));
+    CHECK_CUDA(cuMemAlloc_v2(&to, source.size()));
+    CHECK_CUDA(cuMemsetD8_v2(to, 0xEE, source.size()));
     const auto copy = [](const void* sourceHost, CUdeviceptr sourceDevice, void* targetHost, CUdeviceptr targetDevice,
                          std::size_t x) {
         CUDA_MEMCPY2D rows = {};
@@ -102,7 +102,7 @@ TEST_F(MemoryTest, CopiesOfRowsReachExactlyTheirRectangle) {
         rows.srcY = rows.dstY = x / 8;
         rows.WidthInBytes = kPitch - 3 * x;
         rows.Height = kRows - x / 4;
-        EXPECT_EQ(Api().cuMemcpy2D_v2(&rows), CUDA_SUCCESS);
+        CHECK_CUDA(cuMemcpy2D_v2(&rows));
     };
     copy(source.data(), 0, nullptr, from, 0);
     copy(nullptr, from, nullptr, to, 16);
@@ -112,22 +112,22 @@ TEST_F(MemoryTest, CopiesOfRowsReachExactlyTheirRectangle) {
             const bool inside = x >= 16 && x < 16 + kPitch - 48 && y >= 2 && y < 2 + kRows - 4;
             ASSERT_EQ(result[y * kPitch + x], inside ? source[y * kPitch + x] : 0xEE) << x << ", " << y;
         }
-    EXPECT_EQ(Api().cuMemFree_v2(from), CUDA_SUCCESS);
-    EXPECT_EQ(Api().cuMemFree_v2(to), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemFree_v2(from));
+    CHECK_CUDA(cuMemFree_v2(to));
 }
 
 TEST_F(MemoryTest, FillsWriteTheirPattern) {
     // Larger than a part of a fill, and no multiple of it.
     constexpr std::size_t kWords = 150'001;
     CUdeviceptr block = 0;
-    ASSERT_EQ(Api().cuMemAlloc_v2(&block, kWords * 4), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemAlloc_v2(&block, kWords * 4));
     std::vector<unsigned> words(kWords);
-    const auto read = [&] { ASSERT_EQ(Api().cuMemcpyDtoH_v2(words.data(), block, kWords * 4), CUDA_SUCCESS); };
-    ASSERT_EQ(Api().cuMemsetD32_v2(block, 0x12345678, kWords), CUDA_SUCCESS);
+    const auto read = [&] { CHECK_CUDA(cuMemcpyDtoH_v2(words.data(), block, kWords * 4)); };
+    CHECK_CUDA(cuMemsetD32_v2(block, 0x12345678, kWords));
     read();
     EXPECT_EQ(words, std::vector<unsigned>(kWords, 0x12345678));
-    ASSERT_EQ(Api().cuMemsetD16_v2(block, 0xABCD, 3), CUDA_SUCCESS);
-    ASSERT_EQ(Api().cuMemsetD2D32_v2(block + 40, 32, 7, 2, 2), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemsetD16_v2(block, 0xABCD, 3));
+    CHECK_CUDA(cuMemsetD2D32_v2(block + 40, 32, 7, 2, 2));
     read();
     EXPECT_EQ(words[0], 0xABCDABCDU);
     EXPECT_EQ(words[1], 0x1234ABCDU);
@@ -135,18 +135,18 @@ TEST_F(MemoryTest, FillsWriteTheirPattern) {
                                          0x12345678, 0x12345678, 0x12345678, 7,          7};
     EXPECT_EQ(std::vector<unsigned>(words.begin() + 10, words.begin() + 20), expected);
     EXPECT_EQ(Api().cuMemsetD32_v2(block + 2, 0, 1), CUDA_ERROR_INVALID_VALUE);
-    EXPECT_EQ(Api().cuMemFree_v2(block), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemFree_v2(block));
 }
 
 TEST_F(MemoryTest, HostMemoryIsRegisteredOnce) {
     std::array<char, 4096> memory{};
-    EXPECT_EQ(Api().cuMemHostRegister_v2(memory.data(), memory.size(), 0), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemHostRegister_v2(memory.data(), memory.size(), 0));
     EXPECT_EQ(Api().cuMemHostRegister_v2(memory.data() + 100, 50, 0), CUDA_ERROR_HOST_MEMORY_ALREADY_REGISTERED);
-    EXPECT_EQ(Api().cuMemHostUnregister(memory.data()), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemHostUnregister(memory.data()));
     EXPECT_EQ(Api().cuMemHostUnregister(memory.data()), CUDA_ERROR_HOST_MEMORY_NOT_REGISTERED);
     void* pinned = nullptr;
-    ASSERT_EQ(Api().cuMemHostAlloc(&pinned, 8 << 20, CU_MEMHOSTALLOC_PORTABLE), CUDA_SUCCESS);
-    EXPECT_EQ(Api().cuMemFreeHost(pinned), CUDA_SUCCESS);
+    CHECK_CUDA(cuMemHostAlloc(&pinned, 8 << 20, CU_MEMHOSTALLOC_PORTABLE));
+    CHECK_CUDA(cuMemFreeHost(pinned));
     EXPECT_EQ(Api().cuMemFreeHost(pinned), CUDA_ERROR_INVALID_VALUE);
 }
 
