@@ -52,7 +52,8 @@ constexpr FrameRate kFrameRate_Zero;
 
 /// Half a frame in ticks: truncate(ticks * 0.5 + 0.5), so that odd durations round up.
 [[nodiscard]] constexpr std::int64_t HalfFrameTicks(std::int64_t frameTicks) {
-    return static_cast<std::int64_t>(static_cast<double>(frameTicks) * 0.5 + 0.5);
+    // Halved last, which is exact: the same to the bit.
+    return static_cast<std::int64_t>((static_cast<double>(frameTicks) + 1.0) * 0.5);
 }
 
 /// A time in ticks.
