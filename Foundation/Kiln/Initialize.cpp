@@ -30,7 +30,9 @@ struct State {
 };
 
 State& GetState() {
-    static State state;
+    // Never destroyed: what a program that doesn't terminate Kiln leaves open ends with the process. The drivers may be
+    // gone by the time of static destructors.
+    static State& state = *new State;
     return state;
 }
 

@@ -10,6 +10,7 @@
 #include "SoftCuda/Controls.h"
 #include "SoftCuda/KernelAbi.h"
 #include "SoftCuda/Objects.h"
+#include "SoftCuda/PerThread.h"
 #include "SoftCuda/ThreadPool.h"
 
 using namespace SoftCuda;
@@ -23,7 +24,10 @@ constexpr int kDriverVersion = 12000;
 constexpr int kMaxThreads = 1024;
 constexpr int kMaxGrid = 65535;
 
-thread_local std::vector<CUcontext> tContexts;
+struct ContextStack {
+    std::vector<CUcontext> contexts;
+};
+std::vector<CUcontext>& GetStack() { return GetPerThread<ContextStack>().contexts; }
 
 int GetAttribute(CUdevice_attribute attribute, int& value) {
     constexpr int kUnlimited = 0x7FFFFFFF;
@@ -97,7 +101,8 @@ CUresult DestroyContext(CUcontext handle) {
         if (found == driver.contexts.end()) return CUDA_ERROR_INVALID_CONTEXT;
         context = std::move(driver.contexts.extract(found).value());
     }
-    tContexts.erase(std::remove(tContexts.begin(), tContexts.end(), handle), tContexts.end());
+    std::vector<CUcontext>& stack = GetStack();
+    stack.erase(std::remove(stack.begin(), stack.end(), handle), stack.end());
     context->Synchronize();
     GetMemory().FreeAllOf(handle);
     return CUDA_SUCCESS;
@@ -117,7 +122,10 @@ Driver& GetDriver() {
     return driver;
 }
 
-CUcontext GetCurrent() { return tContexts.empty() ? nullptr : tContexts.back(); }
+CUcontext GetCurrent() {
+    const std::vector<CUcontext>& stack = GetStack();
+    return stack.empty() ? nullptr : stack.back();
+}
 
 CUresult NeedContext(CUcontext& context) {
     context = GetCurrent();
@@ -245,7 +253,7 @@ CUresult cuCtxCreate(CUcontext* context, unsigned /*flags*/, CUdevice device) {
     made->device = device;
     made->defaultStream.context = made.get();
     *context = made.get();
-    tContexts.push_back(made.get());
+    GetStack().push_back(made.get());
     Driver& driver = GetDriver();
     const std::lock_guard<std::mutex> lock(driver.mutex);
     driver.contexts.insert(std::move(made));
@@ -270,23 +278,25 @@ CUresult cuCtxDetach(CUcontext context) {
 
 CUresult cuCtxPushCurrent(CUcontext context) {
     if (!IsAlive(context)) return CUDA_ERROR_INVALID_CONTEXT;
-    tContexts.push_back(context);
+    GetStack().push_back(context);
     return CUDA_SUCCESS;
 }
 SOFTCUDA_V2(cuCtxPushCurrent);
 
 CUresult cuCtxPopCurrent(CUcontext* context) {
-    if (tContexts.empty()) return CUDA_ERROR_INVALID_CONTEXT;
-    if (context != nullptr) *context = tContexts.back();
-    tContexts.pop_back();
+    std::vector<CUcontext>& stack = GetStack();
+    if (stack.empty()) return CUDA_ERROR_INVALID_CONTEXT;
+    if (context != nullptr) *context = stack.back();
+    stack.pop_back();
     return CUDA_SUCCESS;
 }
 SOFTCUDA_V2(cuCtxPopCurrent);
 
 CUresult cuCtxSetCurrent(CUcontext context) {
     if (context != nullptr && !IsAlive(context)) return CUDA_ERROR_INVALID_CONTEXT;
-    if (!tContexts.empty()) tContexts.pop_back();
-    if (context != nullptr) tContexts.push_back(context);
+    std::vector<CUcontext>& stack = GetStack();
+    if (!stack.empty()) stack.pop_back();
+    if (context != nullptr) stack.push_back(context);
     return CUDA_SUCCESS;
 }
 

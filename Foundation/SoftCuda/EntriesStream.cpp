@@ -134,7 +134,7 @@ CUresult cuEventRecord(CUevent event, CUstream handle) {
 CUresult cuEventQuery(CUevent event) {
     if (event == nullptr) return CUDA_ERROR_INVALID_HANDLE;
     const auto record = event->Get();
-    return !record || record->point.stream->IsReached(record->point.ticket) ? CUDA_SUCCESS : CUDA_ERROR_NOT_READY;
+    return !record || record->IsReached() ? CUDA_SUCCESS : CUDA_ERROR_NOT_READY;
 }
 
 CUresult cuEventSynchronize(CUevent event) {
@@ -149,7 +149,7 @@ CUresult cuEventElapsedTime(float* milliseconds, CUevent start, CUevent end) {
     const auto first = start->Get();
     const auto last = end->Get();
     if (!first || !last) return CUDA_ERROR_INVALID_HANDLE;
-    if (cuEventQuery(start) != CUDA_SUCCESS || cuEventQuery(end) != CUDA_SUCCESS) return CUDA_ERROR_NOT_READY;
+    if (!first->IsReached() || !last->IsReached()) return CUDA_ERROR_NOT_READY;
     *milliseconds = std::chrono::duration<float, std::milli>(*last->time - *first->time).count();
     return CUDA_SUCCESS;
 }

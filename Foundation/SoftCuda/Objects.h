@@ -33,6 +33,8 @@ struct CUevent_st {
     struct Record {
         SoftCuda::StreamPoint point;
         SoftCuda::Stream::Stamp time = std::make_shared<Clock::time_point>();
+
+        [[nodiscard]] bool IsReached() const { return point.stream->IsReached(point.ticket); }
     };
     CUcontext context = nullptr;
     std::mutex mutex;  ///< of the pointer
@@ -71,7 +73,7 @@ struct CUmod_st {
 
 struct CUctx_st {
     int device = 0;
-    int references = 1;
+    std::atomic<int> references{1};
     std::mutex mutex;  ///< of the sets
     CUstream_st defaultStream;
     std::set<std::unique_ptr<CUstream_st>> streams;

@@ -10,6 +10,7 @@
 #include <cstring>
 
 #include "SoftCuda/KernelAbi.h"
+#include "SoftCuda/PerThread.h"
 
 namespace SoftCuda {
 
@@ -69,11 +70,7 @@ Counters& GetCounters() {
     return counters;
 }
 
-namespace {
-thread_local std::string tMessage;
-}
-
-void SetMessage(std::string message) { tMessage = std::move(message); }
-const char* GetMessage() { return tMessage.c_str(); }
+void SetMessage(std::string message) { GetPerThread<std::string>() = std::move(message); }
+const char* GetMessage() { return GetPerThread<std::string>().c_str(); }
 
 }  // namespace SoftCuda

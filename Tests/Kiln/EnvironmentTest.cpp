@@ -14,9 +14,9 @@ namespace {
 using testing::HasSubstr;
 using testing::Not;
 
-/// What the probe program prints when it is started with these variables.
-std::string Probe(const std::string& variables) {
-    const std::string command = "env " + variables + " " VANTREL_PROBE " 2>&1";
+/// What the probe program prints when it is started with these variables; it must end well.
+std::string Probe(const std::string& variables, const std::string& arguments = "") {
+    const std::string command = "env " + variables + " " VANTREL_PROBE " " + arguments + " 2>&1";
     const auto close = [](std::FILE* pipe) { EXPECT_EQ(::pclose(pipe), 0); };
     const std::unique_ptr<std::FILE, decltype(close)> pipe(::popen(command.c_str(), "r"), close);
     std::string output;
@@ -52,6 +52,10 @@ TEST(Environment, ChoosesADriverOfCuda) {
     EXPECT_THAT(soft, HasSubstr("cuda=3"));
     EXPECT_THAT(soft, HasSubstr("on the CPU"));
     EXPECT_THAT(Probe("KILN_OPENCL=none SOFTCUDA_MEMORY_MB=512 KILN_CUDA_DRIVER=soft"), HasSubstr("512 MB"));
+}
+
+TEST(Environment, MayBeLeftWithDevicesAndFramesOpen) {
+    EXPECT_THAT(Probe("KILN_CUDA_DRIVER=soft", "leave"), HasSubstr("cuda=1"));
 }
 
 }  // namespace
