@@ -8,7 +8,7 @@
 
 #include "Host/Software/Effects/Dissolves.h"
 #include "Host/Software/Effects/FrameRepairs.h"
-#include "Host/Software/MulticamGrid.h"
+#include "Host/Software/Effects/MulticamGrid.h"
 #include "Host/Software/Transitions.h"
 
 namespace Vantrel::Host::Software {
@@ -19,6 +19,17 @@ View ViewOf(const SequenceFormat& format, std::uint32_t quality) {
     return {format.width, format.height, {format.aspectNumerator, format.aspectDenominator},
             format.width, format.height, format.frameTicks,
             quality};
+}
+
+/// An angle is rendered as large as the whole monitor, or as its half beside the programme.
+View AngleView(const View& view, bool besideProgram) {
+    View angle = view;
+    if (besideProgram) {
+        angle.sequenceWidth /= 2;
+        angle.width =
+            static_cast<std::int32_t>(static_cast<float>(angle.sequenceWidth) / static_cast<float>(view.ScaleX()));
+    }
+    return angle;
 }
 
 LayerPicture AsLayer(Picture picture, const View& view) {
@@ -148,11 +159,13 @@ Picture NodeRenderer::Adjust(const Node& adjustment, std::int64_t time, const Vi
 
 Picture NodeRenderer::Tile(const Node& multicam, std::int64_t time, const View& view) {
     const auto& options = std::get<MulticamDetail>(multicam.detail).options;
+    const View angleView = AngleView(view, options.showProgram);
     std::vector<Picture> tiles;
     for (const NodeInput& input : multicam.inputs) {
-        tiles.push_back(input.node ? RenderInput(input, time, view) : Picture());
+        tiles.push_back(input.node ? RenderInput(input, time, angleView) : Picture());
     }
-    return DrawMulticamGrid(tiles, options, view);
+    return DrawMulticamGrid(tiles, {view.width, view.height, options.selected, options.showProgram, options.recording,
+                                    options.isNonMulticam, view.Quality()});
 }
 
 }  // namespace Vantrel::Host::Software

@@ -7,12 +7,14 @@
 #include <string>
 
 #include "Halden/DebugDatabase.h"
+#include "Src/Filters/AdjustmentNode.h"
 #include "Src/Filters/CompositorNode.h"
 #include "Src/Filters/DisabledNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/IntrinsicNode.h"
 #include "Src/Filters/MediaNode.h"
+#include "Src/Filters/MulticamNode.h"
 #include "Src/Filters/NestedTimelineNode.h"
 #include "Src/Filters/SWHostRenderClipPrefetch.h"
 #include "Src/Filters/Synthetics/SolidColorNode.h"
@@ -48,6 +50,8 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE Opacity", Make<IntrinsicNode>},
     {u"TQ.XQVE Motion", Make<IntrinsicNode>},
     {u"NestedTimelineNode", Make<NestedTimelineNode>},
+    {u"MulticamRenderNode", Make<MulticamNode>},
+    {u"AdjustmentNode", Make<AdjustmentNode>},
     {u"DisabledNode", Make<DisabledNode>},
     {u"TQ.XQVE Invert", Make<InvertNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},

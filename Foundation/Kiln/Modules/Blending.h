@@ -172,6 +172,18 @@ DEVICE_FUNCTION float DissolveThreshold(int x, int y) {
     return (float)(int)(h >> 8) * (1.0f / 16777216.0f);
 }
 
+/// The layer's colour becomes what the mode makes of it over `below`, as far as that covers.
+DEVICE_FUNCTION void BlendLayerLanes(Lanes4* layer, const Lanes4* below, int mode) {
+    Lanes4 blended;
+    BlendColorLanes(&blended, layer, below, mode);
+    EACH_LANE(i) {
+        const float ab = Saturate(below->w[i]);
+        layer->x[i] = Mix(layer->x[i], blended.x[i], ab);
+        layer->y[i] = Mix(layer->y[i], blended.y[i], ab);
+        layer->z[i] = Mix(layer->z[i], blended.z[i], ab);
+    }
+}
+
 /// Source over, straight: `layer` becomes the result. Its alpha is multiplied by the coverage.
 /// @param x,y place of the first lane in the target
 DEVICE_FUNCTION void BlendOverLanes(Lanes4* layer, const Lanes4* below, const float* coverage, int mode, int x, int y) {
@@ -179,14 +191,7 @@ DEVICE_FUNCTION void BlendOverLanes(Lanes4* layer, const Lanes4* below, const fl
     if (mode == BLEND_DISSOLVE) {
         EACH_LANE(i) layer->w[i] = layer->w[i] > DissolveThreshold(x + i, y) ? 1.0f : 0.0f;
     } else if (mode != BLEND_NORMAL) {
-        Lanes4 blended;
-        BlendColorLanes(&blended, layer, below, mode);
-        EACH_LANE(i) {
-            const float ab = Saturate(below->w[i]);
-            layer->x[i] = Mix(layer->x[i], blended.x[i], ab);
-            layer->y[i] = Mix(layer->y[i], blended.y[i], ab);
-            layer->z[i] = Mix(layer->z[i], blended.z[i], ab);
-        }
+        BlendLayerLanes(layer, below, mode);
     }
     EACH_LANE(i) {
         const float as = layer->w[i];
@@ -224,4 +229,17 @@ DEVICE_FUNCTION void ReplaceLanes(Lanes4* layer, const Lanes4* below, const floa
         layer->z[i] = none ? below->z[i] : mixedZ;
         layer->w[i] = none ? below->w[i] : mixedW;
     }
+}
+
+/// A layer that was made of what lies below takes its place, with a blend mode: `layer` becomes the result, the
+/// coverage is used up.
+/// @param x,y place of the first lane in the target
+DEVICE_FUNCTION void ReplaceBlendedLanes(Lanes4* layer, const Lanes4* below, float* coverage, int mode, int x, int y) {
+    EACH_LANE(i) coverage[i] = Saturate(coverage[i]);
+    if (mode == BLEND_DISSOLVE) {
+        EACH_LANE(i) coverage[i] = coverage[i] > DissolveThreshold(x + i, y) ? 1.0f : 0.0f;
+    } else if (mode != BLEND_NORMAL) {
+        BlendLayerLanes(layer, below, mode);
+    }
+    ReplaceLanes(layer, below, coverage);
 }

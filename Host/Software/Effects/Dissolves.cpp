@@ -6,6 +6,7 @@
 #include <cmath>
 
 #include "Host/Software/Effects/BlendModes.h"
+#include "Kiln/BlendMode.h"
 
 namespace Vantrel::Host::Software {
 
@@ -79,18 +80,21 @@ void LayAdjusted(const Picture& adjusted, const Picture& matte, double opacity, 
                  Picture& picture) {
     for (int y = 0; y < picture.height; ++y) {
         for (int x = 0; x < picture.width; ++x) {
-            const double share = std::clamp(static_cast<double>(matte.At(x, y)[3]) * opacity, 0.0, 1.0);
+            double share = std::clamp(static_cast<double>(matte.At(x, y)[3]) * opacity, 0.0, 1.0);
+            if (blendMode == Kiln::kBlend_Dissolve) share = share > DissolveThreshold(x, y) ? 1.0 : 0.0;
             if (share == 0.0) continue;
             const Pixel below = picture.Get(x, y);
             const Pixel above = adjusted.Get(x, y);
             const Pixel blended = BlendColor(blendMode, below, above);
+            const double alphaBelow = std::clamp(below[3], 0.0, 1.0);
             const double weightBelow = (1.0 - share) * below[3];
             const double weightAbove = share * above[3];
             Pixel out{};
             out[3] = weightBelow + weightAbove;
-            for (std::size_t c = 0; c < 3 && out[3] > 0; ++c) {
-                const double color = (1.0 - below[3]) * above[c] + below[3] * blended[c];
-                out[c] = (weightBelow * below[c] + weightAbove * color) / out[3];
+            for (std::size_t c = 0; c < 3; ++c) {
+                const double color = (1.0 - alphaBelow) * above[c] + alphaBelow * blended[c];
+                const double mixed = out[3] > 0 ? (weightBelow * below[c] + weightAbove * color) / out[3] : 0.0;
+                out[c] = share < 1.0 ? mixed : color;
             }
             picture.Set(x, y, out);
         }

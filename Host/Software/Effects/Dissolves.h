@@ -31,6 +31,8 @@ namespace Vantrel::Host::Software {
 /// mode's colour of `picture` (b) and `adjusted` (s):
 ///
 ///     a = (1 - k) ab + k as,   c = ((1 - k) ab cb + k as ((1 - ab) cs + ab B(cb, cs))) / a
+///
+/// In the dissolve mode k is 1 where it is greater than the pixel's threshold, else 0.
 void LayAdjusted(const Picture& adjusted, const Picture& matte, double opacity, std::int32_t blendMode,
                  Picture& picture);
 
