@@ -3,6 +3,7 @@
 #include "Host/Snapshot/NodeFactory.h"
 
 #include <algorithm>
+#include <deque>
 #include <utility>
 
 #include "Host/Snapshot/NodeHash.h"
@@ -34,15 +35,29 @@ bool IsIdentity(const Effect& effect) {
     return true;
 }
 
-/// File order, then opacity, then motion.
-std::vector<const Effect*> OrderEffects(const Item& item) {
+Effect NeutralEffect(const Item& item, const char* matchName) {
+    Effect effect;
+    effect.path = item.path + "/" + matchName;
+    effect.matchName = matchName;
+    effect.parameters = FindEffectTable(matchName)->parameters;
+    return effect;
+}
+
+/// File order, then opacity, then motion. An adjustment layer always has those two, if need be those in `neutral`:
+/// otherwise a search for them that begins above it would go on into the picture below and find those of a clip there.
+std::vector<const Effect*> OrderEffects(const Item& item, std::deque<Effect>& neutral) {
+    const bool adjusts = item.media.generator == "adjustment";
     std::vector<const Effect*> ordered;
     for (const Effect& effect : item.effects) {
         if (!IsIntrinsic(effect)) ordered.push_back(&effect);
     }
     for (const char* name : {kOpacityMatchName, kMotionMatchName}) {
-        for (const Effect& effect : item.effects) {
-            if (effect.matchName == name && !IsIdentity(effect)) ordered.push_back(&effect);
+        const auto given = std::find_if(item.effects.begin(), item.effects.end(),
+                                        [name](const Effect& effect) { return effect.matchName == name; });
+        if (given != item.effects.end() && (adjusts || !IsIdentity(*given))) {
+            ordered.push_back(&*given);
+        } else if (adjusts) {
+            ordered.push_back(&neutral.emplace_back(NeutralEffect(item, name)));
         }
     }
     return ordered;
@@ -149,7 +164,8 @@ NodePtr NodeFactory::Effect(const Host::Effect& effect, const ClipRequest& reque
 void NodeFactory::AddOperators(Node& clip, const ClipRequest& request, const NodePtr& input,
                                const MatteLookup& mattes) const {
     bool still = (input->flags & kNodeFlag_Still) != 0;
-    for (const Host::Effect* effect : OrderEffects(*request.placed->item)) {
+    std::deque<Host::Effect> neutral;
+    for (const Host::Effect* effect : OrderEffects(*request.placed->item, neutral)) {
         clip.operators.push_back(Effect(*effect, request, still, mattes));
         still = (clip.operators.back()->flags & kNodeFlag_Still) != 0;
     }

@@ -180,7 +180,9 @@ TEST(Constructs, AnAdjustmentLayerTakesThePlaceOfWhatLiesBelow) {
     EXPECT_EQ(below.inputs.at(0).offset, -2 * kFrame);
     EXPECT_EQ(node.inputs[1].node->kind, NodeKind::kClip);
     EXPECT_EQ(node.inputs[1].node->inputs.at(0).node.get(), &below);
-    EXPECT_EQ(node.inputs[1].node->operators.size(), 1U);
+    ASSERT_EQ(node.inputs[1].node->operators.size(), 3U)
+        << "motion and opacity are its own, never those of a clip below";
+    EXPECT_EQ(node.inputs[1].node->operators[2]->AsEffect()->matchName, "TQ.XQVE Motion");
     EXPECT_EQ(Property(node, "AdjustmentNode::AdjustmentMediaIsOpaque"), "1");
     EXPECT_TRUE(Described(Timeline({Track({adjustment})})).Segments().empty());
 }
