@@ -64,6 +64,27 @@ private:
     TreeCache mCache;
 };
 
+/// Notes that a sequence is being read.
+class SequenceScope {
+public:
+    SequenceScope(TimelineState& state, std::uint32_t id) : mStack(state.sequenceStack) { mStack.push_back(id); }
+    ~SequenceScope() { mStack.pop_back(); }
+    SequenceScope(const SequenceScope&) = delete;
+    SequenceScope& operator=(const SequenceScope&) = delete;
+
+private:
+    std::deque<std::uint32_t>& mStack;
+};
+
+bool IsBeingRead(const TimelineState& state, std::uint32_t id) {
+    return std::find(state.sequenceStack.begin(), state.sequenceStack.end(), id) != state.sequenceStack.end();
+}
+
+void TraceSelfContained(std::uint32_t id) {
+    static Halden::debug::TraceGate gate(kTraceCategory, kTraceLevel);
+    if (gate.IsOpen()) gate.Write("Sequence " + std::to_string(id) + " contains itself and stays black there.");
+}
+
 SegmentsMode ModeOf(const TimelineState& state, bool top) {
     if (!state.usePreviews) return SegmentsMode::kPlain;
     return top ? SegmentsMode::kPreviews : SegmentsMode::kNestedPreviews;
@@ -91,6 +112,12 @@ void TraceReuse(const SegmentInfo& info) {
 }  // namespace
 
 Status SegmentReader::ReadSequence(std::uint32_t id, const SequenceRange& range, const SequenceTarget& target) {
+    // However deep, it would never end.
+    if (IsBeingRead(mState, id)) {
+        TraceSelfContained(id);
+        return Ostrand::kStatus_OK;
+    }
+    const SequenceScope reading(mState, id);
     const VideoSegmentsHandle handle(id, ModeOf(mState, target.top), mState.previewSpec);
     if (!handle.IsValid()) return Ostrand::kStatus_OK;
     if (target.top) {

@@ -29,7 +29,8 @@ class SegmentReader {
 public:
     explicit SegmentReader(TimelineState& state) : mState(state) {}
 
-    /// Reads a range of a sequence; at the top, nothing when its hash hasn't changed.
+    /// Reads a range of a sequence; at the top, nothing when its hash hasn't changed, and nothing of one that is being
+    /// read already, which contains itself: what stands for it there renders its default, black.
     /// @return 0, also when the host has no segment list; or the failure to learn the sequence's format.
     Status ReadSequence(std::uint32_t id, const SequenceRange& range, const SequenceTarget& target);
 

@@ -44,6 +44,9 @@ struct TimelineState {
     std::deque<Vellum::PixelAspectRatio> aspectStack;
     std::deque<std::uint32_t> fieldStack;
 
+    /// The sequences being read, the top one first.
+    std::deque<std::uint32_t> sequenceStack;
+
     /// The front of the four stacks for readers without the lock: through boost::atomic_load and atomic_store only.
     boost::shared_ptr<const SequenceInfo> topFormat;
 

@@ -149,5 +149,36 @@ TEST_F(NestedSequence, AMulticamTracksSequenceServesWhenThereIsNoOther) {
     EXPECT_EQ(Probe(Build(10).tree).segmentTrees.size(), 2U);
 }
 
+TEST_F(NestedSequence, OneThatContainsItselfIsBlackThere) {
+    // The inner sequence's second clip is the outer one, then the inner one itself.
+    for (const std::uint32_t contained : {kTop, kInner}) {
+        AddNestedClip(12);
+        host.nodes[512].properties["MediaNode::NestedSequenceTimelineID"] = std::to_string(contained);
+        const auto trees = Probe(Build(10).tree).segmentTrees;
+        ASSERT_EQ(trees.size(), 2U);
+        const ProbeNode& endless = Probe(trees[1].tree);
+        EXPECT_EQ(endless.key, "NestedTimelineNode");
+        EXPECT_TRUE(endless.segmentTrees.empty());
+        EXPECT_EQ(Describe(endless.defaultTree), "BlackVideoSource");
+    }
+}
+
+TEST_F(NestedSequence, NestingMayBeTwentyDeep) {
+    constexpr std::uint32_t kDepth = 20;
+    host.nodes[510].properties["MediaNode::NestedSequenceTimelineID"] = "100";
+    for (std::uint32_t id = 100; id < 100 + kDepth; ++id) {
+        AddNestedClip(id);
+        host.nodes[id + 500].properties["MediaNode::NestedSequenceTimelineID"] = std::to_string(id + 1);
+        AddSegment(id, 0, 1000, id);
+    }
+    AddSegment(100 + kDepth, 0, 1000, 11);
+    RenderNodeRef tree = Build(10).tree;
+    for (std::uint32_t depth = 0; depth <= kDepth; ++depth) {
+        ASSERT_EQ(Probe(tree).segmentTrees.size(), 1U) << depth;
+        tree = Probe(tree).segmentTrees[0].tree;
+    }
+    EXPECT_EQ(Describe(tree), "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))");
+}
+
 }  // namespace
 }  // namespace Vantrel::Testing
