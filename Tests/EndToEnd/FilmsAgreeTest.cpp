@@ -63,6 +63,34 @@ TEST_F(FilmsAgree, OnBothFrameworksAtEveryQuality) {
     }
 }
 
+TEST_F(FilmsAgree, StructuresOnBothFrameworksAndOnTheHost) {
+    const struct {
+        const char* name;
+        std::vector<std::int64_t> frames;
+    } examples[] = {{"adjustment", {10, 40, 70}}, {"multicam", {5, 25, 45, 65}}, {"nested", {5, 30, 60}}};
+    for (const auto& example : examples) {
+        SCOPED_TRACE(example.name);
+        const std::string file = std::string(VANTREL_EXAMPLES) + "/" + example.name + "/" + example.name + ".otio";
+        FilmOptions options;
+        options.width = 480;
+        options.height = 270;
+        options.frames = example.frames;
+        options.deviceMemory = ~std::uint64_t{0};  // all of it: the limit outlives a session
+        const Film cuda = RenderFilm(file, options);
+        EXPECT_EQ(cuda.summary.hostFrames, 0);
+        EXPECT_TRUE(cuda.failures.empty());
+        options.device = DeviceChoice::kOpenCL;
+        const Difference frameworks = Compare(cuda, RenderFilm(file, options));
+        EXPECT_LE(frameworks.levels, 1) << frameworks.place;
+        // A device on which no frame has room leaves all to the host.
+        options.deviceMemory = 1;
+        const Film host = RenderFilm(file, options);
+        EXPECT_GT(host.summary.hostFrames, 0);
+        const Difference renderers = Compare(cuda, host);
+        EXPECT_LE(renderers.levels, 2) << renderers.place;
+    }
+}
+
 class WithLittleMemory : public FilmsAgree {
 protected:
     /// Three layers, of which two are drawn with motion, in a picture of 3840 by 2160.
