@@ -4,7 +4,7 @@
 
 #include <cstring>
 
-#include "Host/Media/DeepPicture.h"
+#include "Host/Media/PlanarBytes.h"
 
 extern "C" {
 #include <libavutil/pixdesc.h>
@@ -126,6 +126,13 @@ void PictureConverter::Prepare(const AVFrame& frame, AVPixelFormat target) {
     mPlanar.reset();
 }
 
+void PictureConverter::ConvertBytes(const AVFrame& frame, const HostPicture& picture) {
+    Prepare(frame, AV_PIX_FMT_BGRA);
+    std::uint8_t* const planes[] = {reinterpret_cast<std::uint8_t*>(picture.pixels.get())};
+    const int strides[] = {picture.rowBytes};
+    sws_scale(mScaler.get(), frame.data, frame.linesize, 0, frame.height, planes, strides);
+}
+
 std::shared_ptr<HostPicture> PictureConverter::ConvertDeep(const AVFrame& frame) {
     Prepare(frame, AV_PIX_FMT_GBRAPF32);
     if (!mPlanar) {
@@ -161,11 +168,8 @@ std::shared_ptr<HostPicture> PictureConverter::Convert(const AVFrame& frame, int
         picture = MakeHostPicture(*mPool, Vellum::kPixelFormat_BGRA_4444_32f, frame.width, frame.height);
         if (!ConvertDeepPicture(frame, WeightsOf(frame), IsFullRange(frame), *picture)) picture = ConvertDeep(frame);
     } else {
-        Prepare(frame, AV_PIX_FMT_BGRA);
         picture = MakeHostPicture(*mPool, Vellum::kPixelFormat_BGRA_4444_8u, frame.width, frame.height);
-        std::uint8_t* const planes[] = {reinterpret_cast<std::uint8_t*>(picture->pixels.get())};
-        const int strides[] = {picture->rowBytes};
-        sws_scale(mScaler.get(), frame.data, frame.linesize, 0, frame.height, planes, strides);
+        if (!ConvertPlanarBytes(frame, WeightsOf(frame), IsFullRange(frame), *picture)) ConvertBytes(frame, *picture);
     }
     const AVPixFmtDescriptor* format = av_pix_fmt_desc_get(static_cast<AVPixelFormat>(frame.format));
     picture->alphaType =

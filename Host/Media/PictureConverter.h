@@ -21,6 +21,7 @@ public:
 
 private:
     void Prepare(const AVFrame& frame, AVPixelFormat target);
+    void ConvertBytes(const AVFrame& frame, const HostPicture& picture);
     [[nodiscard]] std::shared_ptr<HostPicture> ConvertDeep(const AVFrame& frame);
 
     std::shared_ptr<PixelBufferPool> mPool;

@@ -115,24 +115,53 @@ void WeaveFields(HostPicture& upper, const HostPicture& lower) {
     for (std::int32_t y = 1; y < upper.height; y += 2) std::memcpy(upper.GetRow(y), lower.GetRow(y), bytes);
 }
 
+namespace {
+
+void LayByteRowOverBlack(std::uint8_t* row, std::int32_t width) {
+    // Most rows of most films have nothing transparent in them, and that is soon known.
+    std::uint32_t common = 0xFFFFFFFF;
+    for (std::int32_t x = 0; x < width; ++x) {
+        std::uint32_t word = 0;
+        std::memcpy(&word, row + 4 * static_cast<std::ptrdiff_t>(x), sizeof word);
+        common &= word;
+    }
+    if (common >> 24 == 255) return;
+    for (std::int32_t x = 0; x < width; ++x) {
+        const unsigned alpha = row[4 * x + 3];
+        for (int c = 0; c < 3; ++c) row[4 * x + c] = static_cast<std::uint8_t>((row[4 * x + c] * alpha + 127U) / 255U);
+        row[4 * x + 3] = 255;
+    }
+}
+
+void LayFloatRowOverBlack(float* row, std::int32_t width) {
+    for (std::int32_t x = 0; x < width; ++x) {
+        const float alpha = row[4 * x + 3];
+        for (int c = 0; c < 3; ++c) row[4 * x + c] *= alpha;
+        row[4 * x + 3] = 1.0F;
+    }
+}
+
+void MakeRowOpaque(HostPicture& picture, std::int32_t y) {
+    if (Vellum::BytesPerPixel(picture.format) == 4) {
+        auto* row = reinterpret_cast<std::uint8_t*>(picture.GetRow(y));
+        for (std::int32_t x = 0; x < picture.width; ++x) row[4 * x + 3] = 255;
+    } else {
+        auto* row = reinterpret_cast<float*>(picture.GetRow(y));
+        for (std::int32_t x = 0; x < picture.width; ++x) row[4 * x + 3] = 1.0F;
+    }
+}
+
+}  // namespace
+
 void LayOverBlack(HostPicture& picture) {
     const bool opaque = IsOpaque(picture);
     for (std::int32_t y = 0; y < picture.height; ++y) {
-        if (Vellum::BytesPerPixel(picture.format) == 4) {
-            auto* row = reinterpret_cast<std::uint8_t*>(picture.GetRow(y));
-            for (std::int32_t x = 0; x < picture.width; ++x) {
-                const unsigned alpha = opaque ? 255U : row[4 * x + 3];
-                for (int c = 0; c < 3; ++c)
-                    row[4 * x + c] = static_cast<std::uint8_t>((row[4 * x + c] * alpha + 127U) / 255U);
-                row[4 * x + 3] = 255;
-            }
+        if (opaque) {
+            MakeRowOpaque(picture, y);
+        } else if (Vellum::BytesPerPixel(picture.format) == 4) {
+            LayByteRowOverBlack(reinterpret_cast<std::uint8_t*>(picture.GetRow(y)), picture.width);
         } else {
-            auto* row = reinterpret_cast<float*>(picture.GetRow(y));
-            for (std::int32_t x = 0; x < picture.width; ++x) {
-                const float alpha = opaque ? 1.0F : row[4 * x + 3];
-                for (int c = 0; c < 3; ++c) row[4 * x + c] *= alpha;
-                row[4 * x + 3] = 1.0F;
-            }
+            LayFloatRowOverBlack(reinterpret_cast<float*>(picture.GetRow(y)), picture.width);
         }
     }
     picture.alphaType = Vellum::kAlphaType_None;

@@ -29,17 +29,27 @@ Vellum::PixelAspectRatio ScaleAspect(Vellum::PixelAspectRatio aspect, const Vell
 
 }  // namespace
 
-/// A frame on its way: everything that the engine was given for it, and the sign that its host pictures are there.
+/// A frame on its way: everything that the engine was given for it, and the sign that it is ready to render.
+///
+/// The engine's preparation takes only pictures that are there, so a frame goes through two sets of results: the first
+/// gathers the host's pictures, and when the last one has come the second takes them over and is staged.
 struct FrameLoop::Request {
     std::int64_t number = 0;
     SegmentInfo info;
     boost::shared_ptr<RenderParams> params;
-    RenderResultsRef results;
-    bool refused = false;  ///< the host refused a picture: nothing will complete
+    RenderResultsRef gathered;
+    RenderResultsRef results;  ///< what the frame is rendered with; settled once it is prepared
+    bool refused = false;      ///< the host refused a picture: nothing will complete
 
     std::mutex mutex;
     std::condition_variable changed;
     bool prepared = false;
+
+    void SetPrepared() {
+        const std::lock_guard<std::mutex> hold(mutex);
+        prepared = true;
+        changed.notify_all();
+    }
 };
 
 FrameLoop::FrameLoop(boost::shared_ptr<RenderSystem> system, std::shared_ptr<PixelBufferPool> pool,
@@ -80,25 +90,43 @@ void FrameLoop::Prepare(const RenderJob& job, std::int64_t number) {
     if (mSystem->GetSegmentInfo(time, request->info, false) != 0) request->info = SegmentInfo();
     request->params = boost::make_shared<RenderParams>(MakeParams(job, time, request->info));
     const std::weak_ptr<Request> weak = request;
-    request->results = boost::make_shared<RenderResults>([weak] {
-        const std::shared_ptr<Request> done = weak.lock();
-        if (!done) return;
-        const std::lock_guard<std::mutex> hold(done->mutex);
-        done->prepared = true;
-        done->changed.notify_all();
+    request->gathered = boost::make_shared<RenderResults>([weak, system = mSystem] {
+        if (const std::shared_ptr<Request> complete = weak.lock()) Stage(*system, complete);
     });
+    request->results = request->gathered;
     mAhead.push_back(request);
     const RenderNodeRef& root = request->info.tree;
     if (!root) {
         request->prepared = true;
         return;
     }
-    if (root->CollectHostFrames(*request->params, request->results, mPrevious) != 0 &&
-        Ostrand::Failed(root->RequestHostFrames(*request->params, request->results))) {
+    if (root->CollectHostFrames(*request->params, request->gathered, mPrevious) != 0 &&
+        Ostrand::Failed(root->RequestHostFrames(*request->params, request->gathered))) {
         request->refused = true;
         return;
     }
-    mSystem->PrepareRender(root, request->params, request->results);
+    // The piece that was counted from the start, so that nothing completes while there is more to ask for.
+    request->gathered->EndAsyncPiece();
+}
+
+void FrameLoop::Stage(RenderSystem& system, const std::shared_ptr<Request>& request) {
+    const std::weak_ptr<Request> weak = request;
+    const auto results = boost::make_shared<RenderResults>([weak] {
+        if (const std::shared_ptr<Request> complete = weak.lock()) complete->SetPrepared();
+    });
+    try {
+        const bool complete = !request->gathered->HasFailed() &&
+                              request->info.tree->CollectHostFrames(*request->params, results, request->gathered) == 0;
+        if (complete) {
+            request->results = results;
+            system.PrepareRender(request->info.tree, request->params, results);
+            return;
+        }
+    } catch (const std::exception&) {
+        // What keeps the pictures from being handed over will show in the render.
+    }
+    // With a picture missing the frame is rendered as far as it goes, and nothing is copied ahead.
+    request->SetPrepared();
 }
 
 void FrameLoop::WaitUntilPrepared(Request& request, RenderSummary& summary) {
@@ -163,7 +191,7 @@ RenderedFrame FrameLoop::RenderNext(const RenderJob& job, RenderSummary& summary
 
 void FrameLoop::Abandon() {
     for (const std::shared_ptr<Request>& request : mAhead) {
-        if (request->info.tree) request->info.tree->CancelHostFrames(*request->params, request->results);
+        if (request->info.tree) request->info.tree->CancelHostFrames(*request->params, request->gathered);
     }
     RenderSummary unused;
     for (const std::shared_ptr<Request>& request : mAhead) WaitUntilPrepared(*request, unused);

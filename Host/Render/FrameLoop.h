@@ -72,6 +72,8 @@ private:
     struct Request;
 
     void Prepare(const RenderJob& job, std::int64_t number);
+    /// Has a frame whose pictures have come copied for the device. On whatever thread brought the last one.
+    static void Stage(RenderSystem& system, const std::shared_ptr<Request>& request);
     [[nodiscard]] RenderParams MakeParams(const RenderJob& job, std::int64_t time, const SegmentInfo& info) const;
     RenderedFrame RenderNext(const RenderJob& job, RenderSummary& summary);
     [[nodiscard]] std::shared_ptr<HostPicture> RenderOnDevice(const RenderJob& job, Request& request,

@@ -2,7 +2,9 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <gtest/gtest.h>
 
+#include <array>
 #include <cmath>
+#include <random>
 
 #include "Host/Media/PictureConverter.h"
 #include "Tests/Host/Render/Films.h"
@@ -118,6 +120,57 @@ TEST_F(PictureConverterTest, DeepChromaLiesBetweenItsSamples) {
     EXPECT_NEAR(red(7, 3) - none, 0.25 * whole, 1e-6);
     EXPECT_NEAR(red(7, 4) - none, 0.75 * whole, 1e-6);
     EXPECT_NEAR(red(7, 5) - none, whole, 1e-6);
+}
+
+/// A plane's value at a place in its own samples; beyond the border the border goes on.
+double ValueBetween(const AVFrame& frame, int plane, double x, double y, int width, int height) {
+    const auto at = [&](double column, double row) {
+        const auto c = static_cast<int>(std::fmin(std::fmax(column, 0.0), width - 1.0));
+        const auto r = static_cast<int>(std::fmin(std::fmax(row, 0.0), height - 1.0));
+        return static_cast<double>(frame.data[plane][frame.linesize[plane] * r + c]);
+    };
+    const double left = std::floor(x), top = std::floor(y);
+    const double upper = at(left, top) + (x - left) * (at(left + 1, top) - at(left, top));
+    const double lower = at(left, top + 1) + (x - left) * (at(left + 1, top + 1) - at(left, top + 1));
+    return upper + (y - top) * (lower - upper);
+}
+
+TEST_F(PictureConverterTest, ChromaOfBytesLiesWhereThePictureSays) {
+    std::mt19937 random(7);
+    for (const auto& [format, across, down] :
+         {std::array<int, 3>{AV_PIX_FMT_YUV420P, 1, 1}, {AV_PIX_FMT_YUV422P, 1, 0}, {AV_PIX_FMT_YUV444P, 0, 0}}) {
+        for (const auto location : {AVCHROMA_LOC_LEFT, AVCHROMA_LOC_CENTER}) {
+            const Host::Frame frame = MakeYuv(static_cast<AVPixelFormat>(format), 37, 23, 0, 0, 0);
+            frame->chroma_location = location;
+            frame->colorspace = AVCOL_SPC_BT709;
+            const int width = AV_CEIL_RSHIFT(37, across), height = AV_CEIL_RSHIFT(23, down);
+            for (int plane = 0; plane < 3; ++plane) {
+                for (int i = 0; i < frame->linesize[plane] * (plane == 0 ? 23 : height); ++i) {
+                    frame->data[plane][i] = static_cast<std::uint8_t>(random() % 256);
+                }
+            }
+            const auto picture = mConverter.Convert(*frame, 0);
+            const double shift = location == AVCHROMA_LOC_CENTER && across != 0 ? 0.25 : 0.0;
+            for (int y = 0; y < 23; ++y) {
+                for (int x = 0; x < 37; ++x) {
+                    const double u = x / (1.0 + across) - shift, v = down != 0 ? (y + 0.5) / 2 - 0.5 : y;
+                    const double luma = frame->data[0][frame->linesize[0] * y + x] - 16;
+                    const double cb = ValueBetween(*frame, 1, u, v, width, height) - 128;
+                    const double cr = ValueBetween(*frame, 2, u, v, width, height) - 128;
+                    const double red = luma / 219 + 2 * (1 - kBT709.kr) * cr / 224;
+                    const double blue = luma / 219 + 2 * (1 - kBT709.kb) * cb / 224;
+                    const double green =
+                        (luma / 219 - kBT709.kr * red - kBT709.kb * blue) / (1 - kBT709.kr - kBT709.kb);
+                    const double expected[] = {blue, green, red};
+                    for (int c = 0; c < 3; ++c) {
+                        const double level = 255 * std::fmin(std::fmax(expected[c], 0.0), 1.0);
+                        ASSERT_NEAR(static_cast<int>(picture->GetRow(y)[4 * x + c]), level, 0.6)
+                            << format << " at " << x << ", " << y << " channel " << c << " located " << location;
+                    }
+                }
+            }
+        }
+    }
 }
 
 TEST_F(PictureConverterTest, AStreamThatSaysNothingIsJudgedByItsHeight) {
