@@ -145,7 +145,7 @@ TEST_P(FrameNumbers, OfTheSampleTimelinesAreThoseOfTheirItems) {
         Check(name, document, film, numberOf);
         ++samples;
     }
-    EXPECT_EQ(samples, 8U);
+    EXPECT_EQ(samples, 6U);
 }
 
 TEST_P(FrameNumbers, OfRandomTimelinesAreThoseOfTheirItems) {

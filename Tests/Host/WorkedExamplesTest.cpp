@@ -118,32 +118,6 @@ TEST(WorkedExamples, CrossDissolve) {
     }
 }
 
-TEST(WorkedExamples, NestedSequenceAtTwiceTheSpeed) {
-    Json more = Effects({Warp(2.0)});
-    more["source_range"] = Range(40, 60);
-    const Json nested = Stack({Track({Clip("P", 0, 120), Clip("Q", 0, 120)})}, more);
-    const Published described(Timeline({Track({Gap(24), nested})}));
-    ExpectSegments(described, {{24, 84, 0}});
-    const Node& clip = OnlyClip(described.Segments()[0]);
-    EXPECT_EQ(clip.inputs.front().offset, -20 * kFrame);
-    const Node& media = *clip.inputs.front().node;
-    EXPECT_EQ(Property(media, "MediaNode::ClipID"), "(fails)");
-    EXPECT_NE(Property(media, "MediaNode::NestedSequenceTimelineID"), "(fails)");
-    EXPECT_EQ(clip.TransformTime(50 * kFrame), 100 * kFrame);
-    EngineWalk engine;
-    struct Case {
-        std::int64_t time;
-        const char* media;
-        std::int64_t frame;
-    };
-    for (const Case& c : {Case{54, "/media/P.mov", 100}, Case{64, "/media/Q.mov", 0}, Case{83, "/media/Q.mov", 38}}) {
-        const std::vector<Shown> shown = engine.At(c.time * kFrame);
-        ASSERT_EQ(shown.size(), 1U) << c.time;
-        EXPECT_EQ(shown[0].media, c.media);
-        EXPECT_EQ(shown[0].frame, c.frame);
-    }
-}
-
 Json BlurKeys() {
     return {{"blurriness",
              {{"keyframes",
