@@ -162,7 +162,7 @@ ResolvedMedia MediaResolver::Offline(const Item& clip, const SequenceFormat& for
     resolved.offline = true;
     resolved.instance = clip.media.file;
     const std::string line = clip.media.path + ": \"" + clip.name + "\": " + reason;
-    if (std::find(mOffline.begin(), mOffline.end(), line) == mOffline.end()) mOffline.push_back(line);
+    if (mKnownOffline.insert(line).second) mOffline.push_back(line);
     return resolved;
 }
 

@@ -4,6 +4,7 @@
 
 #include <map>
 #include <optional>
+#include <set>
 #include <string>
 #include <vector>
 
@@ -62,6 +63,7 @@ private:
     IdentityBook& mIdentities;
     std::map<std::string, MediaProbeResult> mProbed;
     std::vector<std::string> mOffline;
+    std::set<std::string> mKnownOffline;
     std::uint32_t mFirstSubType = 0;
 };
 

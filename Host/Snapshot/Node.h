@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <map>
 #include <memory>
 #include <string>
 #include <utility>
@@ -185,6 +186,8 @@ struct SegmentList {
     std::vector<Segment> segments;
     /// Of the format and of every segment's place and content.
     Guid hash;
+    /// The segments' roots by their hash: made once, as the engine opens a list for every update and nesting.
+    std::map<Guid, NodePtr> roots;
 
     /// The segment that covers a time, or null.
     [[nodiscard]] const Segment* Find(std::int64_t time) const;

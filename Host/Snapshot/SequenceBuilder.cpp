@@ -68,6 +68,13 @@ std::vector<Segment> CutIntoSegments(const std::vector<TrackLayout>& tracks, con
     return segments;
 }
 
+/// Of a list whose segments are all there.
+void Finish(SegmentList& list, const SequenceFormat& format) {
+    list.hash = HashSegments(list.segments, format);
+    list.roots.clear();
+    for (const Segment& segment : list.segments) list.roots.emplace(segment.root->hash, segment.root);
+}
+
 }  // namespace
 
 SequenceBuilder::SequenceBuilder(const Document& document, const SnapshotOptions& options, IMediaProbe& probe,
@@ -133,7 +140,7 @@ SegmentList SequenceBuilder::AddPreviews(const SegmentList& plain, const Sequenc
         segment.offset -= firstOffset.at(segment.root->hash);
         segment.root = factory.Preview(mMedia.Register(*result.info, FileSource{file.string()}));
     }
-    list.hash = HashSegments(list.segments, format);
+    Finish(list, format);
     return list;
 }
 
@@ -160,7 +167,7 @@ SequencePtr SequenceBuilder::Build(const std::string& key, const Item& named, co
     }
     LayerNodes nodes(*this, format);
     sequence->plain.segments = CutIntoSegments(tracks, trackIDs, nodes);
-    sequence->plain.hash = HashSegments(sequence->plain.segments, format);
+    Finish(sequence->plain, format);
     sequence->withPreviews = mOptions.previews.empty() ? sequence->plain : AddPreviews(sequence->plain, format);
     mSnapshot.sequences[sequence->timelineID] = sequence;
     mBuilt[key] = sequence;

@@ -77,8 +77,8 @@ VantrelHostStatus GetSegmentInfo(std::uint32_t segmentsID, std::int32_t index, s
 VantrelHostStatus AcquireSegmentNode(std::uint32_t segmentsID, const char* hashText, std::uint32_t* nodeID) {
     const auto held = Services().GetSegmentLists().Find(segmentsID);
     if (!held) return kFailed;
-    const auto root = held->roots.find(Guid(std::string(hashText)));
-    if (root == held->roots.end()) return kFailed;
+    const auto root = held->list->roots.find(Guid(std::string(hashText)));
+    if (root == held->list->roots.end()) return kFailed;
     *nodeID = Services().GetNodes().Acquire(root->second);
     return kOk;
 }

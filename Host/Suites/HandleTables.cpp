@@ -67,7 +67,6 @@ std::uint32_t SegmentListTable::Acquire(const SequencePtr& sequence, bool previe
     auto held = std::make_shared<HeldSegments>();
     held->sequence = sequence;
     held->list = previews ? &sequence->withPreviews : &sequence->plain;
-    for (const Segment& segment : held->list->segments) held->roots.emplace(segment.root->hash, segment.root);
     const std::unique_lock<std::shared_mutex> lock(mMutex);
     mHeld.emplace(++mLast, std::move(held));
     return mLast;

@@ -49,7 +49,6 @@ private:
 struct HeldSegments {
     SequencePtr sequence;
     const SegmentList* list = nullptr;
-    std::map<Guid, NodePtr> roots;
 };
 
 class SegmentListTable {

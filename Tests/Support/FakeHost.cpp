@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <chrono>
+#include <numeric>
 #include <sstream>
 
 #include <gtest/gtest.h>
@@ -125,6 +126,12 @@ int FakeHost::Count(const std::string& entry) const {
     const std::lock_guard<std::recursive_mutex> lock(mMutex);
     const auto found = mCounts.find(entry);
     return found == mCounts.end() ? 0 : found->second;
+}
+
+int FakeHost::CountAll() const {
+    const std::lock_guard<std::recursive_mutex> lock(mMutex);
+    return std::accumulate(mCounts.begin(), mCounts.end(), 0,
+                           [](int sum, const auto& entry) { return sum + entry.second; });
 }
 
 void FakeHost::ResetCounts() {

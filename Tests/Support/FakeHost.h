@@ -151,6 +151,8 @@ public:
 
     /// Calls of an entry by its name in HostSuites.h.
     [[nodiscard]] int Count(const std::string& entry) const;
+    /// Calls of all entries.
+    [[nodiscard]] int CountAll() const;
     void ResetCounts();
     /// Requests for renders and for their fingerprints, in order.
     [[nodiscard]] std::vector<FakeRequest> GetRenders() const;

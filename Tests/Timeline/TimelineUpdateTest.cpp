@@ -91,6 +91,29 @@ TEST_F(TimelineUpdate, AMovedClipKeepsItsTreeAndLeavesBlackBehind) {
     EXPECT_EQ(InfoAt(150).tree, still);
 }
 
+TEST_F(TimelineUpdate, MovingOneClipAmongManyBuildsNothingAndAsksForEachSegmentOnce) {
+    constexpr int kSegments = 500;
+    for (std::uint32_t i = 0; i < kSegments; ++i) {
+        AddPlainClip(1000 + i);
+        AddSegment(kTop, 100 * i, 100 * i + 80, 1000 + i);
+    }
+    Timeline& read = Read();
+    const RenderNodeRef moved = InfoAt(25000).tree, neighbour = InfoAt(25100).tree;
+    host.sequences[kTop].segments[250].start += 10;
+    host.sequences[kTop].segments[250].end += 10;
+    Change();
+    host.ResetCounts();
+    created.clear();
+    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    EXPECT_TRUE(created.empty());
+    EXPECT_EQ(host.Count("GetSegmentInfo"), kSegments);
+    // Besides: the list acquired, its hash, its length, the sequence's format, the list released.
+    EXPECT_EQ(host.CountAll(), kSegments + 5);
+    EXPECT_EQ(InfoAt(25010).tree, moved);
+    EXPECT_TRUE(InfoAt(25009).guid.IsNil());
+    EXPECT_EQ(InfoAt(25100).tree, neighbour);
+}
+
 TEST_F(TimelineUpdate, AnotherOffsetOrLengthReplacesTheRecordButNotTheTree) {
     AddPlainClip(10);
     AddSegment(kTop, 0, 100, 10);
