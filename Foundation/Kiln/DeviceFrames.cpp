@@ -44,7 +44,8 @@ Status CreateGPUVideoFrame(VideoFrameRef& out, const DeviceRef& device, Vellum::
                            Vellum::Point origin) {
     out.Reset();
     FrameAttributes attributes;
-    if (!device || !IsRenderFormat(format) || !DescribeFrame(format, width, height, attributes)) {
+    const bool isMask = format == Vellum::kPixelFormat_BGRA_4444_8u;
+    if (!device || !(IsRenderFormat(format) || isMask) || !DescribeFrame(format, width, height, attributes)) {
         return Ostrand::kStatus_Failure;
     }
     attributes.aspect = aspect;

@@ -34,7 +34,8 @@ public:
 };
 
 /// Makes a device frame with undefined pixels. kStatus_OutOfMemory when refused (`out` is then empty), kStatus_Failure
-/// for a size that isn't positive or a format that the device doesn't render in.
+/// for a size that isn't positive or a format that the device doesn't render in. Four bytes a pixel (BGRA_4444_8u) are
+/// had as well: room for a mask of one float a pixel.
 [[nodiscard]] Status CreateGPUVideoFrame(VideoFrameRef& out, const DeviceRef& device, Vellum::PixelFormat format,
                                          std::int32_t width, std::int32_t height, Vellum::PixelAspectRatio aspect,
                                          std::uint32_t fieldType, Vellum::Point origin);

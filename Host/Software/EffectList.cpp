@@ -2,8 +2,10 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <map>
 
-#include "Host/Software/EffectRunner.h"
+#include "Host/Software/CorrectorControls.h"
+#include "Host/Software/EffectContext.h"
 #include "Host/Software/Effects/Invert.h"
+#include "Host/Software/Effects/LumaCorrector.h"
 #include "Vantrel/Effects/Invert.h"
 
 /// The one place that knows which scalar function is which effect: it reads parameters and calls.
@@ -15,11 +17,24 @@ void RunInvert(const EffectContext& context, LayerPicture& layer) {
     Invert(layer.picture, context.Integer(kInvert_Channel), context.Number(kInvert_Blend) / 100.0);
 }
 
+void RunLumaCorrector(const EffectContext& context, LayerPicture& layer) {
+    constexpr std::int32_t kSets = 13, kSetSize = 6;
+    std::array<LumaSet, 4> sets;
+    for (std::int32_t i = 0; i < 4; ++i) {
+        const std::int32_t first = kSets + i * kSetSize;
+        sets[static_cast<std::size_t>(i)] = {context.Number(first) / 255.0, context.Number(first + 1) / 100.0,
+                                             context.Number(first + 2),     context.Number(first + 3),
+                                             context.Number(first + 4),     context.Number(first + 5)};
+    }
+    LumaCorrect(layer.picture, ReadCorrector(context, layer, {39, 44, 6}), sets);
+}
+
 }  // namespace
 
 EffectFunction FindEffectFunction(const std::string& matchName) {
     static const std::map<std::string, EffectFunction> kFunctions = {
         {"TQ.XQVE Invert", RunInvert},
+        {"TQ.XQVE Luma Corrector", RunLumaCorrector},
     };
     const auto found = kFunctions.find(matchName);
     return found == kFunctions.end() ? nullptr : found->second;

@@ -59,21 +59,16 @@ std::string FillInParameters(const EffectDetail& effect, std::int64_t time) {
     return filled;
 }
 
-ParameterValue EffectContext::Value(std::int32_t index) const {
-    const Parameter* parameter = effect.FindParameter(index);
-    return parameter ? parameter->At(time) : ParameterValue{};
-}
-
-std::int32_t EffectContext::Integer(std::int32_t index) const {
-    return static_cast<std::int32_t>(std::lround(Number(index)));
-}
-
-void EffectRunner::Run(const EffectContext& context, LayerPicture& layer) {
-    const EffectDetail& effect = *context.effect.AsEffect();
+void EffectRunner::Run(const EffectDetail& effect, std::int64_t time, const View& view, std::function<Picture()> matte,
+                       LayerPicture& layer) {
     if (const EffectFunction function = FindEffectFunction(effect.matchName)) {
-        function(context, layer);
+        const auto value = [&effect, time](std::int32_t index) {
+            const Parameter* parameter = effect.FindParameter(index);
+            return parameter ? parameter->At(time) : ParameterValue{};
+        };
+        function({effect.matchName, value, time, view, std::move(matte)}, layer);
     } else if (!effect.filterGraph.empty()) {
-        mGraphs.Run(FillInParameters(effect, context.time), context.time, layer);
+        mGraphs.Run(FillInParameters(effect, time), time, layer);
     } else {
         NotePassedThrough(effect.matchName);
     }

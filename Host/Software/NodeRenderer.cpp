@@ -98,7 +98,8 @@ LayerPicture NodeRenderer::RenderClip(const Node& clip, const ItemTimes& times, 
         const Node& effect = *clip.operators[i];
         if (IsIntrinsic(effect)) continue;
         const NodeInput& matte = effect.AsEffect()->matte;
-        mEffects.Run({effect, times.parameters, view, [&] { return RenderInput(matte, times.item, view); }}, layer);
+        mEffects.Run(
+            *effect.AsEffect(), times.parameters, view, [&] { return RenderInput(matte, times.item, view); }, layer);
     }
     return layer;
 }

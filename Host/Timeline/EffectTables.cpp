@@ -57,23 +57,23 @@ private:
 /// Limits a correction to part of the picture, chosen by colour: the same 26 parameters in five correctors.
 void AddSecondary(Builder& table, std::int32_t base) {
     table.Rows(base, Type::kDouble,
-               {{"secondary_hue_center", 0},
-                {"secondary_hue_start", 50},
-                {"secondary_hue_start_softness", 0},
-                {"secondary_hue_end", 50},
-                {"secondary_hue_end_softness", 0}});
+               {{"selection_hue_center", 0},
+                {"selection_hue_start", 50},
+                {"selection_hue_start_softness", 0},
+                {"selection_hue_end", 50},
+                {"selection_hue_end_softness", 0}});
     table.Rows(base + 9, Type::kDouble,
-               {{"secondary_saturation_start", 0},
-                {"secondary_saturation_start_softness", 0},
-                {"secondary_saturation_end", 100},
-                {"secondary_saturation_end_softness", 0}});
+               {{"selection_saturation_start", 0},
+                {"selection_saturation_start_softness", 0},
+                {"selection_saturation_end", 100},
+                {"selection_saturation_end_softness", 0}});
     table.Rows(base + 17, Type::kDouble,
-               {{"secondary_luma_start", 0},
-                {"secondary_luma_start_softness", 0},
-                {"secondary_luma_end", 100},
-                {"secondary_luma_end_softness", 0}});
-    table.Rows(base + 23, Type::kDouble, {{"secondary_soften", 0}, {"secondary_edge_thinning", 0}});
-    table.Row(base + 25, "secondary_invert", Type::kInt);
+               {{"selection_luma_start", 0},
+                {"selection_luma_start_softness", 0},
+                {"selection_luma_end", 100},
+                {"selection_luma_end_softness", 0}});
+    table.Rows(base + 23, Type::kDouble, {{"selection_soften", 0}, {"secondary_edge_thinning", 0}});
+    table.Row(base + 25, "selection_invert", Type::kInt);
 }
 
 void AddTonalRange(Builder& table, std::int32_t base) {
@@ -91,26 +91,6 @@ void AddCorrectorHead(Builder& table) {
 }
 
 constexpr const char* kTonalSets[] = {"master", "shadow", "midtone", "highlight"};
-
-EffectTable LumaCorrector() {
-    Builder table("TQ.XQVE Luma Corrector");
-    AddCorrectorHead(table);
-    AddTonalRange(table, 6);
-    std::int32_t index = 13;
-    for (const std::string set : kTonalSets) {
-        for (const auto& [name, value] : {std::pair{"brightness", 0.0},
-                                          {"contrast", 0.0},
-                                          {"contrast_level", 0.5},
-                                          {"gamma", 1.0},
-                                          {"pedestal", 0.0},
-                                          {"gain", 1.0}}) {
-            table.Row(index++, set + "_" + name, Type::kDouble, {value});
-        }
-    }
-    table.Row(39, "show_mask", Type::kBool);
-    AddSecondary(table, 44);
-    return table.Finish();
-}
 
 void AddGammaPedestalGain(Builder& table, std::int32_t base, const std::string& prefix) {
     table.Row(base, prefix + "_gamma", Type::kDouble, {1})
@@ -376,6 +356,7 @@ EffectTable FromEngine(const EffectRow& effect) {
         const ParameterRow& row = effect.parameters[i];
         table.Row(row.index, row.name, row.type, row.value, row.choiceName);
     }
+    if (effect.changesWithTime) table.DependsOnTime();
     return table.Finish();
 }
 
@@ -385,7 +366,6 @@ std::vector<EffectTable> MakeTables() {
     for (const EffectRow* effect : kEffectTable) tables.push_back(FromEngine(*effect));
     AddPointwise(tables);
     AddSpatial(tables);
-    tables.push_back(LumaCorrector());
     tables.push_back(RgbColorCorrector());
     tables.push_back(ThreeWayColorCorrector());
     tables.push_back(LumaCurve());

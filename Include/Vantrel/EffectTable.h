@@ -6,6 +6,7 @@
 
 #include "Vantrel/Effects/Intrinsics.h"
 #include "Vantrel/Effects/Invert.h"
+#include "Vantrel/Effects/LumaCorrector.h"
 
 /// The effects and their parameters as data, the one place where an index, a name or a default is told: nodes read by
 /// these indices, hosts read files and list effects by these rows. An effect is a header in Vantrel/Effects and a line
@@ -16,6 +17,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kMotionEffect,
     &kOpacityEffect,
     &kInvertEffect,
+    &kLumaCorrectorEffect,
 };
 
 /// The effect of that match name, or null.

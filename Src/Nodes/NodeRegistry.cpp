@@ -11,6 +11,7 @@
 #include "Src/Filters/CompositorNode.h"
 #include "Src/Filters/DisabledNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
+#include "Src/Filters/Effects/LumaCorrectorNode.h"
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/IntrinsicNode.h"
 #include "Src/Filters/MediaNode.h"
@@ -54,6 +55,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"AdjustmentNode", Make<AdjustmentNode>},
     {u"DisabledNode", Make<DisabledNode>},
     {u"TQ.XQVE Invert", Make<InvertNode>},
+    {u"TQ.XQVE Luma Corrector", Make<LumaCorrectorNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

@@ -194,7 +194,7 @@ TEST(Parameters, TablesHaveNoGapsAndNoNameTwice) {
         }
     }
     // The indices that effects read last tell whether a long table has slipped.
-    EXPECT_EQ(FindEffectTable("TQ.XQVE Luma Corrector")->Find("secondary_invert")->index, 69);
+    EXPECT_EQ(FindEffectTable("TQ.XQVE Luma Corrector")->Find("selection_invert")->index, 69);
     EXPECT_EQ(FindEffectTable("TQ.XQVE RGB Color Corrector")->Find("highlight_blue_gain")->index, 61);
     EXPECT_EQ(FindEffectTable("TQ.XQVE Three-Way Color Corrector")->Find("output_white")->index, 104);
     EXPECT_EQ(FindEffectTable("TQ.XQVE RGB Curves")->Find("blue_y15")->index, 132);

@@ -87,7 +87,8 @@ TEST_P(FrameOnEachFramework, RefusesWhatItCannotMake) {
     EXPECT_EQ(make(kPixelFormat_GPU_BGRA_4444_32f, 0, 8), Ostrand::kStatus_Failure);
     EXPECT_FALSE(frame);
     EXPECT_EQ(make(kPixelFormat_GPU_BGRA_4444_32f, 8, -1), Ostrand::kStatus_Failure);
-    EXPECT_EQ(make(Vellum::kPixelFormat_BGRA_4444_8u, 8, 8), Ostrand::kStatus_Failure);
+    EXPECT_EQ(make(Vellum::kPixelFormat_VUYA_4444_8u, 8, 8), Ostrand::kStatus_Failure);
+    EXPECT_EQ(make(Vellum::kPixelFormat_BGRA_4444_8u, 8, 8), Ostrand::kStatus_OK) << "room for a mask";
     EXPECT_EQ(make(Vellum::kPixelFormat_Invalid, 8, 8), Ostrand::kStatus_Failure);
     EXPECT_EQ(make(kPixelFormat_GPU_BGRA_4444_32f, 0x7FFFFFFF, 8), Ostrand::kStatus_Failure);
     EXPECT_EQ(make(kPixelFormat_GPU_BGRA_4444_32f, 1 << 20, 0x7FFFFFFF), Ostrand::kStatus_OutOfMemory);

@@ -1,0 +1,45 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+#pragma once
+
+#include <algorithm>
+#include <array>
+#include <cmath>
+
+#include "Host/Software/Picture.h"
+
+/// What colour effects share. Formulas: Vantrel/Effects/CorrectorParameters.h.
+namespace Vantrel::Host::Software {
+
+/// BT.709.
+[[nodiscard]] inline double Luma(const Pixel& p) { return 0.2126 * p[2] + 0.7152 * p[1] + 0.0722 * p[0]; }
+
+/// 0 for what isn't a number.
+[[nodiscard]] inline double Limit(double value, double low, double high) {
+    return value > low ? std::min(value, high) : low;
+}
+
+[[nodiscard]] inline double SmoothRamp(double low, double high, double x) {
+    if (!(high > low)) return x < low ? 0.0 : 1.0;
+    const double t = Limit((x - low) / (high - low), 0.0, 1.0);
+    return t * t * (3.0 - 2.0 * t);
+}
+
+/// Four levels: up to where all is shadow, from where nothing is, up to where nothing is highlight, from where all is.
+using TonalRange = std::array<double, 4>;
+
+struct TonalShares {
+    double shadow, midtone, highlight;
+};
+[[nodiscard]] inline TonalShares ShareTones(double luma, const TonalRange& range) {
+    const double beyondShadow = SmoothRamp(range[0], range[1], luma);
+    const double highlight = SmoothRamp(range[2], range[3], luma) * beyondShadow;
+    return {1.0 - beyondShadow, beyondShadow - highlight, highlight};
+}
+
+/// value^(1 / gamma), and from 0 down the value itself.
+[[nodiscard]] inline double GammaLevel(double value, double gamma) {
+    return value > 0.0 ? std::pow(value, 1.0 / std::max(gamma, 0.01)) : value;
+}
+
+}  // namespace Vantrel::Host::Software

@@ -1,0 +1,174 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+// What holds of every effect: its kernel agrees with the scalar version, and its defaults leave the picture alone.
+#include <sstream>
+
+#include "Host/Software/EffectContext.h"
+#include "Tests/Effects/EffectTester.h"
+#include "Vantrel/EffectTable.h"
+
+namespace Vantrel::Testing {
+namespace {
+
+using Host::Software::EffectContext;
+using Host::Software::EffectFunction;
+using Host::Software::LayerPicture;
+using Values = std::map<std::int32_t, std::array<double, 4>>;
+
+/// What makes an effect's comparison its own.
+struct EffectCase {
+    const char* matchName;
+    /// The share of pixels that may differ: where a comparison of two nearly equal numbers decides.
+    double exceptionShare = 0.0;
+    bool neutralByDefault = true;
+};
+
+std::array<double, 4> RandomValue(Random& random, const ParameterRow& row) {
+    std::array<double, 4> value = row.value;
+    const auto uniform = [&] {
+        return static_cast<double>(random.Uniform(static_cast<float>(row.minimum), static_cast<float>(row.maximum)));
+    };
+    switch (row.type) {
+        case ParameterType::kBool:
+            value[0] = random.Chance(0.3F) ? 1.0 : 0.0;
+            break;
+        case ParameterType::kFloat:
+        case ParameterType::kDouble:
+            // Extremes are far apart in many tables: half of the values stay near the default.
+            value[0] = random.Chance(0.5F) ? uniform() : static_cast<float>(0.8 * row.value[0] + 0.2 * uniform());
+            break;
+        case ParameterType::kColor:
+            for (double& c : value) c = random.Int(0, 4) * 0.25;
+            break;
+        case ParameterType::kPoint:
+            for (std::size_t c = 0; c < 2; ++c) value[c] = static_cast<double>(random.Uniform(-0.2F, 1.2F));
+            break;
+        default:
+            value[0] = random.Int(static_cast<int>(row.minimum), static_cast<int>(row.maximum));
+    }
+    return value;
+}
+
+/// Most parameters at their defaults, some at random.
+Values RandomValues(Random& random, const EffectRow& effect) {
+    const float share = random.Chance(0.5F) ? 1.0F : 0.3F;
+    Values values;
+    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+        const ParameterRow& row = effect.parameters[i];
+        values[row.index] = random.Chance(share) ? RandomValue(random, row) : row.value;
+    }
+    return values;
+}
+
+FakeParam ToParam(const ParameterRow& row, const std::array<double, 4>& value) {
+    switch (row.type) {
+        case ParameterType::kBool:
+            return value[0] != 0.0;
+        case ParameterType::kFloat:
+            return static_cast<float>(value[0]);
+        case ParameterType::kDouble:
+            return value[0];
+        case ParameterType::kPoint:
+            return FakePoint{value[0], value[1]};
+        case ParameterType::kColor: {
+            std::array<std::uint16_t, 4> words{};  // blue, green, red, alpha
+            const std::size_t order[] = {2, 1, 0, 3};
+            for (std::size_t c = 0; c < 4; ++c) words[c] = static_cast<std::uint16_t>(value[order[c]] * 65280.0);
+            return words;
+        }
+        default:
+            return static_cast<std::int32_t>(value[0]);
+    }
+}
+
+std::string Describe(const EffectRow& effect, const Values& values) {
+    std::ostringstream text;
+    text << effect.matchName;
+    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+        const auto& value = values.at(effect.parameters[i].index);
+        if (value != effect.parameters[i].value) text << ", " << effect.parameters[i].name << " " << value[0];
+    }
+    return text.str();
+}
+
+bool Softens(const EffectRow& effect, const Values& values) {
+    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+        const ParameterRow& row = effect.parameters[i];
+        if (std::string(row.name) == "selection_soften" && values.at(row.index)[0] > 0.0) return true;
+    }
+    return false;
+}
+
+class EveryEffect : public EffectTest {
+protected:
+    Picture OnDevice(const EffectRow& effect, const Values& values, const Picture& picture) {
+        Params params;
+        for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+            params[effect.parameters[i].index] = ToParam(effect.parameters[i], values.at(effect.parameters[i].index));
+        }
+        return Apply(effect.matchName, params, picture);
+    }
+
+    static Picture OnHost(const EffectRow& effect, const Values& values, const Picture& picture) {
+        const EffectFunction function = Host::Software::FindEffectFunction(effect.matchName);
+        EXPECT_NE(function, nullptr) << effect.matchName << " has no scalar version";
+        LayerPicture layer;
+        layer.picture = picture;
+        layer.aspect = {1, 1};
+        EffectContext context;
+        context.matchName = effect.matchName;
+        context.value = [&values](std::int32_t index) {
+            const auto found = values.find(index);
+            return found == values.end() ? std::array<double, 4>{} : found->second;
+        };
+        context.view.width = context.view.sequenceWidth = picture.width;
+        context.view.height = context.view.sequenceHeight = picture.height;
+        if (function) function(context, layer);
+        return layer.picture;
+    }
+};
+
+constexpr EffectCase kCases[] = {
+    {"TQ.XQVE Luma Corrector", 0.01},
+};
+
+TEST_P(EveryEffect, AgreesWithItsScalarVersion) {
+    Random random;
+    constexpr int kTries = 24;
+    for (const EffectCase& effectCase : kCases) {
+        const EffectRow* effect = FindEffect(effectCase.matchName);
+        ASSERT_NE(effect, nullptr) << effectCase.matchName;
+        for (int i = 0; i < kTries; ++i) {
+            const Picture picture = RoundTo(RandomPicture(random, random.Int(1, 70), random.Int(1, 40)), GetFormat());
+            const Values values = RandomValues(random, *effect);
+            Tolerance tolerance = GetTolerance();
+            tolerance.exceptionShare = effectCase.exceptionShare;
+            // A recursive blur adds up roundings the longer the wider it is.
+            if (Softens(*effect, values)) tolerance = {5e-4, 1e-3, false, effectCase.exceptionShare};
+            EXPECT_TRUE(PicturesAgree(OnDevice(*effect, values, picture),
+                                      RoundTo(OnHost(*effect, values, picture), GetFormat()), tolerance))
+                << Describe(*effect, values) << "; " << picture.width << " by " << picture.height << ", seed "
+                << random.GetSeed();
+        }
+    }
+}
+
+TEST_P(EveryEffect, ItsDefaultsKeepEveryBit) {
+    Random random;
+    SCOPED_TRACE(random.GetSeed());
+    for (const EffectCase& effectCase : kCases) {
+        if (!effectCase.neutralByDefault) continue;
+        const EffectRow& effect = *FindEffect(effectCase.matchName);
+        Values values;
+        for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+            values[effect.parameters[i].index] = effect.parameters[i].value;
+        }
+        const Picture picture = RoundTo(RandomPicture(random, 67, 9), GetFormat());
+        EXPECT_TRUE(PicturesAgree(OnDevice(effect, values, picture), picture, kExactly)) << effect.matchName;
+    }
+}
+
+INSTANTIATE_TEST_SUITE_P(Devices, EveryEffect, ::testing::ValuesIn(AllDeviceCases()), NameOfCase);
+
+}  // namespace
+}  // namespace Vantrel::Testing
