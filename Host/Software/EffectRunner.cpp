@@ -59,11 +59,12 @@ std::string FillInParameters(const EffectDetail& effect, std::int64_t time) {
     return filled;
 }
 
-void EffectRunner::Run(const EffectDetail& effect, std::int64_t time, const View& view, std::function<Picture()> matte,
+void EffectRunner::Run(const Node& node, std::int64_t time, const View& view, std::function<Picture()> matte,
                        LayerPicture& layer) {
+    const EffectDetail& effect = *node.AsEffect();
     if (const EffectFunction function = FindEffectFunction(effect.matchName)) {
-        const auto value = [&effect, time](std::int32_t index) {
-            const Parameter* parameter = effect.FindParameter(index);
+        const auto value = [&node, time](std::int32_t index) {
+            const Parameter* parameter = node.FindParameter(index);
             return parameter ? parameter->At(time) : ParameterValue{};
         };
         function({effect.matchName, value, time, view, std::move(matte)}, layer);

@@ -27,7 +27,7 @@ public:
     /// @param time   parameter time
     /// @param matte  gives the picture of the layer that a matte comes from
     /// Throws std::runtime_error.
-    void Run(const EffectDetail& effect, std::int64_t time, const View& view, std::function<Picture()> matte,
+    void Run(const Node& effect, std::int64_t time, const View& view, std::function<Picture()> matte,
              LayerPicture& layer);
     /// Takes note of something that shows as if it weren't there.
     void NotePassedThrough(const std::string& matchName);

@@ -99,7 +99,7 @@ LayerPicture NodeRenderer::RenderClip(const Node& clip, const ItemTimes& times, 
         if (IsIntrinsic(effect)) continue;
         const NodeInput& matte = effect.AsEffect()->matte;
         mEffects.Run(
-            *effect.AsEffect(), times.parameters, view, [&] { return RenderInput(matte, times.item, view); }, layer);
+            effect, times.parameters, view, [&] { return RenderInput(matte, times.item, view); }, layer);
     }
     return layer;
 }

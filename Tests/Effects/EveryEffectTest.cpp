@@ -143,8 +143,8 @@ TEST_P(EveryEffect, AgreesWithItsScalarVersion) {
             const Values values = RandomValues(random, *effect);
             Tolerance tolerance = GetTolerance();
             tolerance.exceptionShare = effectCase.exceptionShare;
-            // A recursive blur adds up roundings the longer the wider it is.
-            if (Softens(*effect, values)) tolerance = {5e-4, 1e-3, false, effectCase.exceptionShare};
+            // The weights of a wide recursion nearly cancel: their rounding shows as gain.
+            if (Softens(*effect, values)) tolerance = {5e-3, 5e-3, false, effectCase.exceptionShare};
             EXPECT_TRUE(PicturesAgree(OnDevice(*effect, values, picture),
                                       RoundTo(OnHost(*effect, values, picture), GetFormat()), tolerance))
                 << Describe(*effect, values) << "; " << picture.width << " by " << picture.height << ", seed "
