@@ -149,7 +149,7 @@ TEST_P(FrameNumbers, OfTheSampleTimelinesAreThoseOfTheirItems) {
 }
 
 TEST_P(FrameNumbers, OfRandomTimelinesAreThoseOfTheirItems) {
-    constexpr unsigned kTimelines = 500;
+    constexpr unsigned kTimelines = VANTREL_RANDOM_TIMELINES;
     constexpr int kMediaFrames = 120;
     const Folder folder("vantrel-random");
     std::vector<TestMediaPlan> plans;
