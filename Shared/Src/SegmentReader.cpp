@@ -127,32 +127,32 @@ Status SegmentReader::ReadSequence(std::uint32_t id, const SequenceRange& range,
             mState.lastHash = hash;
         }
     }
+    const std::int32_t count = handle.GetSegmentCount();
     SequenceInfo format;
     const Status status = GetSequenceInfo(id, format);
     if (Ostrand::Failed(status)) return status;
 
     const FormatScope scope(mState, format, target.top);
     if (!target.top) {
-        ReadContent(handle, range, target);
+        ReadContent(handle, count, range, target);
         return Ostrand::kStatus_OK;
     }
     CacheGeneration generation(mState);
     if (!mState.blackTree) mState.blackTree = TreeBuilder(mState, *this).BuildBlackTree();
-    ReadContent(handle, range, target);
+    ReadContent(handle, count, range, target);
     generation.Commit();
     return Ostrand::kStatus_OK;
 }
 
-void SegmentReader::ReadContent(const VideoSegmentsHandle& handle, const SequenceRange& range,
+void SegmentReader::ReadContent(const VideoSegmentsHandle& handle, std::int32_t count, const SequenceRange& range,
                                 const SequenceTarget& target) {
-    const std::int64_t reached = AddSegments(handle, range, target);
+    const std::int64_t reached = AddSegments(handle, count, range, target);
     if (reached < range.out) AddGap(reached, range.out, target.top);
 }
 
-std::int64_t SegmentReader::AddSegments(const VideoSegmentsHandle& handle, const SequenceRange& range,
-                                        const SequenceTarget& target) {
+std::int64_t SegmentReader::AddSegments(const VideoSegmentsHandle& handle, std::int32_t count,
+                                        const SequenceRange& range, const SequenceTarget& target) {
     std::int64_t reached = range.in;
-    const std::int32_t count = handle.GetSegmentCount();
     for (std::int32_t index = 0; index < count; ++index) {
         VideoSegment entry;
         if (!Ostrand::Failed(handle.GetSegmentInfo(index, entry))) {
@@ -195,9 +195,10 @@ void SegmentReader::AddSegment(const VideoSegmentsHandle& handle, const Segment&
     const SegmentInfo* const standing = FindSegment(mState.renderMap, place.in);
     const bool unchanged = standing && !standing->nested && standing->guid == segment.guid &&
                            standing->in == place.in && standing->out == place.out && standing->offset == place.offset;
-    const SegmentVerdict verdict = unchanged ? VerdictOf(*standing) : PlaceSegment(handle, segment, target.top);
-
     const auto nestedNode = Ostrand::Query<INestedTimelineNode>(target.parentTree);
+    // Most segments of most updates: nobody asks for the verdict, and the tree isn't touched.
+    if (unchanged && !nestedNode) return;
+    const SegmentVerdict verdict = unchanged ? VerdictOf(*standing) : PlaceSegment(handle, segment, target.top);
     if (!nestedNode) return;
     FoldSegmentIntoNested(target.parentInfo, verdict);
     nestedNode->AddSegmentTree(verdict.tree, segment.start, segment.sourceStart, segment.end);
@@ -245,9 +246,8 @@ SegmentVerdict SegmentReader::BuildTree(const VideoSegmentsHandle& handle, const
     // A segment that couldn't be read has no entry in the maps; the others go on.
     if (Ostrand::Failed(status)) return {};
     EnterSegment(info, branch.host, branch.ok, top, branch.tree);
+    // Remembered by the record, which also knows of branches that went to the host as a whole.
     SegmentVerdict verdict = VerdictOf(info);
-    verdict.ok = branch.ok;
-    verdict.host = branch.host;
     verdict.tree = branch.tree;
     return verdict;
 }

@@ -45,8 +45,9 @@ private:
         Guid guid;
     };
 
-    void ReadContent(const VideoSegmentsHandle& handle, const SequenceRange& range, const SequenceTarget& target);
-    std::int64_t AddSegments(const VideoSegmentsHandle& handle, const SequenceRange& range,
+    void ReadContent(const VideoSegmentsHandle& handle, std::int32_t count, const SequenceRange& range,
+                     const SequenceTarget& target);
+    std::int64_t AddSegments(const VideoSegmentsHandle& handle, std::int32_t count, const SequenceRange& range,
                              const SequenceTarget& target);
     void AddSegment(const VideoSegmentsHandle& handle, const Segment& segment, const SequenceTarget& target);
     void AddGap(std::int64_t from, std::int64_t to, bool top);

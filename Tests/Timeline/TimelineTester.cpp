@@ -123,8 +123,13 @@ RenderNodeRef TimelineTester::CreateNode(const Halden::WideString& key, const Vi
     std::string name = Halden::ToUTF8(key);
     created.push_back(name);
     if (refused.count(name) != 0) return {};
-    if (unregistered.count(name) != 0) name = "HostRenderSubtree";
-    if (needHost.count(name) != 0 || name == "HostRenderSubtree") needsHost = true;
+    if (unregistered.count(name) != 0 || failing.count(name) != 0) name = "HostRenderSubtree";
+    if (name == "HostRenderSubtree" && description) {
+        // Media in their own right and whole structures don't count as work that the device couldn't do.
+        const NodeType type = description->GetNodeType();
+        needsHost |= type == NodeType::kClip || type == NodeType::kTransition || type == NodeType::kEffect;
+    }
+    if (needHost.count(name) != 0) needsHost = true;
     return RenderNodeRef(new ProbeNode(name, description, requirements));
 }
 

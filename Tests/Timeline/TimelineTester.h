@@ -14,6 +14,7 @@
 #include "Src/Filters/INestedTimelineNode.h"
 #include "Src/VideoNodes/VideoNode.h"
 #include "Tests/Support/HostedTest.h"
+#include "Tests/Timeline/VerdictCount.h"
 
 namespace Vantrel::Testing {
 
@@ -67,7 +68,7 @@ public:
 };
 
 /// A timeline over a scripted host and a scripted node creator.
-class TimelineTester : public HostedTest {
+class TimelineTester : public HostedTest, protected CreatorScript {
 protected:
     static constexpr std::uint32_t kTop = 1;
     static constexpr std::uint32_t kInner = 2;
@@ -101,10 +102,7 @@ protected:
     /// The tree of a segment that shows one node, and what is known of it.
     SegmentInfo Build(std::uint32_t node);
 
-    std::set<std::string> unregistered;  ///< keys that come back as a host subtree
-    std::set<std::string> refused;       ///< keys for which nothing comes back
-    std::set<std::string> needHost;      ///< keys whose nodes render through the host
-    std::vector<std::string> created;    ///< keys that were asked for, in order
+    std::vector<std::string> created;  ///< keys that were asked for, in order
     std::unique_ptr<Timeline> timeline;
 
 private:
