@@ -45,6 +45,8 @@ Effect NeutralEffect(const Item& item, const char* matchName) {
 
 /// File order, then opacity, then motion. An adjustment layer always has those two, if need be those in `neutral`:
 /// otherwise a search for them that begins above it would go on into the picture below and find those of a clip there.
+/// What has opacity has motion: a tree without it gets a node for it, which in front of a nested sequence's only layer
+/// would find that layer's opacity and apply it once more.
 std::vector<const Effect*> OrderEffects(const Item& item, std::deque<Effect>& neutral) {
     const bool adjusts = item.media.generator == "adjustment";
     std::vector<const Effect*> ordered;
@@ -52,11 +54,12 @@ std::vector<const Effect*> OrderEffects(const Item& item, std::deque<Effect>& ne
         if (!IsIntrinsic(effect)) ordered.push_back(&effect);
     }
     for (const char* name : {kOpacityMatchName, kMotionMatchName}) {
+        const bool fades = !ordered.empty() && ordered.back()->matchName == kOpacityMatchName;
         const auto given = std::find_if(item.effects.begin(), item.effects.end(),
                                         [name](const Effect& effect) { return effect.matchName == name; });
         if (given != item.effects.end() && (adjusts || !IsIdentity(*given))) {
             ordered.push_back(&*given);
-        } else if (adjusts) {
+        } else if (adjusts || fades) {
             ordered.push_back(&neutral.emplace_back(NeutralEffect(item, name)));
         }
     }
@@ -203,7 +206,8 @@ Node NodeFactory::StartMedia(const ClipRequest& request, const MediaClipPtr& cli
     detail.name = item.name;
     detail.scale = item.options.scale;
     detail.alpha = item.options.alpha;
-    detail.frameBlend = item.options.frameBlend;
+    // A sequence that the engine renders itself isn't blended: its media node has no such property.
+    detail.frameBlend = item.options.frameBlend && clip->id != 0;
     detail.deinterlace = item.options.deinterlace;
     detail.reverseFieldDominance = item.options.reverseFieldDominance;
     const bool merges =

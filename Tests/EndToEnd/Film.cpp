@@ -41,11 +41,13 @@ Film RenderFilm(const std::string& file, const FilmOptions& options) {
     job.format = options.format;
 
     std::vector<std::pair<std::int64_t, std::int64_t>> stretches{{0, render.GetFrameCount()}};
-    if (!options.frames.empty()) {
-        stretches.clear();
-        for (const std::int64_t frame : options.frames) stretches.emplace_back(frame, frame + 1);
-    }
     Film film;
+    film.frames = options.frames;
+    if (options.choose && render.GetFrameCount() > 0) film.frames = options.choose(render.GetFrameCount());
+    if (!film.frames.empty()) {
+        stretches.clear();
+        for (const std::int64_t frame : film.frames) stretches.emplace_back(frame, frame + 1);
+    }
     film.frameTicks = render.GetSequence().format.frameTicks;
     const std::atomic<bool> stop{false};
     for (const auto& [first, end] : stretches) {

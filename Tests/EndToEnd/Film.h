@@ -45,11 +45,14 @@ struct FilmOptions {
     Vellum::PixelFormat format = Vellum::kPixelFormat_BGRA_4444_8u;
     /// Frames to render, every one if empty.
     std::vector<std::int64_t> frames;
+    /// Picks the frames to render of a film of so many; wins over `frames`.
+    std::function<std::vector<std::int64_t>(std::int64_t)> choose;
 };
 
 struct Film {
     std::vector<HostPictureRef> pictures;
-    std::int64_t frameTicks = 0;  ///< of the sequence
+    std::vector<std::int64_t> frames;  ///< their places, if some were picked
+    std::int64_t frameTicks = 0;       ///< of the sequence
     RenderSummary summary;
     std::vector<std::string> failures;
 };

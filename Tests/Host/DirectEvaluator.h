@@ -10,17 +10,25 @@
 
 namespace Vantrel::Host::Test {
 
-/// What is seen at a moment, as the items say it: a frame of media, layers from the bottom up, or the mix of a
-/// transition's two sides.
+/// What is seen at a moment, as the items say it.
 struct Sight {
-    enum class Kind { kFrame, kLayers, kMix };
+    enum class Kind {
+        kFrame,       ///< of media
+        kPlain,       ///< one opaque level
+        kLayers,      ///< parts from the bottom up
+        kTransition,  ///< parts are the outgoing side and the incoming one; a blank side has no layers
+        kSum,         ///< parts by their weights
+        kInverted,    ///< its one part
+        kAdjustment,  ///< whatever lies below it, and nothing of its own
+    };
 
     Kind kind = Kind::kLayers;
     Shown frame;
-    /// kMix: the outgoing side and the incoming one; a blank side has no layers.
+    double level = 0;  ///< kPlain
     std::vector<Sight> parts;
-    /// kMix: share of the incoming side.
-    double fraction = 0;
+    std::vector<double> weights;  ///< kSum
+    const Item* item = nullptr;   ///< kTransition, kAdjustment
+    double fraction = 0;          ///< kTransition: how much of it has passed
 };
 
 /// Which frame stands at a time between two: the one that has begun, as descriptions number frames; or, where frames
@@ -36,7 +44,9 @@ public:
 
     [[nodiscard]] std::vector<Shown> At(std::int64_t time);
     /// The same with its structure.
-    [[nodiscard]] Sight SightAt(std::int64_t time) { return ShowStack(mDocument.tracks, time); }
+    [[nodiscard]] Sight SightAt(std::int64_t time);
+    /// Something in the last sight lay so near between two frames that rounding decides.
+    [[nodiscard]] bool IsDoubtful() const { return mDoubtful; }
 
 private:
     struct Part {
@@ -58,18 +68,24 @@ private:
         std::int64_t end = 0;
 
         [[nodiscard]] bool Shows(std::size_t part) const;
+        [[nodiscard]] bool Joins(std::size_t part) const;
     };
 
     [[nodiscard]] static Expanded Expand(const Item& track);
     [[nodiscard]] static std::int64_t LengthOf(const Item& composition);
+    [[nodiscard]] static std::int64_t LayerLength(const Item& layer);
     [[nodiscard]] Sight ShowComposition(const Item& composition, std::int64_t time);
-    [[nodiscard]] Sight ShowStack(const Item& stack, std::int64_t time);
+    [[nodiscard]] Sight ShowLayers(const std::vector<const Item*>& layers, std::int64_t time);
     [[nodiscard]] Sight ShowTrack(const Item& track, std::int64_t time);
     [[nodiscard]] Sight ShowItem(const Item& item, std::int64_t length, std::int64_t itemTime);
+    [[nodiscard]] Sight ShowContent(const Item& item, std::int64_t length, std::int64_t itemTime);
+    [[nodiscard]] Sight ShowMedia(const Item& item, std::int64_t mediaTime, double speed);
+    [[nodiscard]] std::int64_t NearestFrame(std::int64_t mediaTime, std::int64_t step);
 
     const Document& mDocument;
     std::int64_t mFrame;
     Between mBetween;
+    bool mDoubtful = false;
 };
 
 }  // namespace Vantrel::Host::Test
