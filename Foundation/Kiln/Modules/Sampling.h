@@ -175,9 +175,12 @@ DEVICE_FUNCTION void RestrainLanes(Lanes4* pixels, AnyFrame in, int format, Regi
 #if defined(DIALECT_LEVEL)
 #include "Kiln/Modules/SamplingCpu.h"
 #else
-DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across,
-                                    Reach down, const float* u, const float* v) {
+/// The filtered picture at LANES positions. Returns 1 when all that was read is known to be opaque: the sums are
+/// straight already.
+DEVICE_FUNCTION int SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across,
+                                   Reach down, const float* u, const float* v) {
     SampleTaps(sum, in, format, region, filter, across, down, u, v);
+    return 0;
 }
 
 typedef struct Tile {
@@ -191,9 +194,10 @@ DEVICE_FUNCTION void BeginTile(Tile* tile, AnyFrame in, int format, Region regio
 }
 
 /// As SampleFiltered for one of the tile's lines: v is the same for all lanes.
-DEVICE_FUNCTION void SampleTileLine(Lanes4* sum, const Tile* tile, AnyFrame in, int format, Region region, int filter,
-                                    Reach across, Reach down, const float* u, const float* v) {
+DEVICE_FUNCTION int SampleTileLine(Lanes4* sum, const Tile* tile, AnyFrame in, int format, Region region, int filter,
+                                   Reach across, Reach down, const float* u, const float* v) {
     SampleTaps(sum, in, format, region, filter, across, down, u, v);
+    return 0;
 }
 #endif
 

@@ -8,6 +8,7 @@
 
 typedef float Vector8 __attribute__((vector_size(32)));
 typedef int Index8 __attribute__((vector_size(32)));
+typedef float Vector16 __attribute__((vector_size(64)));
 
 /// A filter that reaches further is sampled tap by tap.
 #define MOST_TAPS 32
@@ -44,21 +45,34 @@ DEVICE_FUNCTION const uchar* PixelAddress(AnyFrame in, int format, int index) {
     return in.address + static_cast<std::ptrdiff_t>(index) * PixelBytes(format);
 }
 
-DEVICE_FUNCTION Vector4 AddHalves(Vector8 pair) {
-    return __builtin_shufflevector(pair, pair, 0, 1, 2, 3) + __builtin_shufflevector(pair, pair, 4, 5, 6, 7);
-}
+DEVICE_FUNCTION Vector4 LowHalf(Vector8 pair) { return __builtin_shufflevector(pair, pair, 0, 1, 2, 3); }
+DEVICE_FUNCTION Vector4 HighHalf(Vector8 pair) { return __builtin_shufflevector(pair, pair, 4, 5, 6, 7); }
+DEVICE_FUNCTION Vector4 AddHalves(Vector8 pair) { return LowHalf(pair) + HighHalf(pair); }
 
-/// Two neighbouring pixels, premultiplied.
-DEVICE_FUNCTION Vector8 LoadWeighedPair(const uchar* address, int format) {
+/// Two neighbouring pixels.
+DEVICE_FUNCTION Vector8 LoadPair(const uchar* address, int format) {
     Vector8 pair;
     if (format == 0)
         pair = __builtin_shufflevector(SoftCuda::LoadHalf4(address), SoftCuda::LoadHalf4(address + 8), 0, 1, 2, 3, 4, 5,
                                        6, 7);
     else
         __builtin_memcpy(&pair, address, sizeof pair);
-    const Vector8 ones = {1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f};
-    return pair * __builtin_shuffle(pair, ones, Index8{3, 3, 3, 8, 7, 7, 7, 12});
+    return pair;
 }
+
+/// Two pixels premultiplied. In two steps, which are cheaper than one shuffle of two operands.
+DEVICE_FUNCTION Vector8 WeighPair(Vector8 pair) {
+    const Vector8 ones = {1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f};
+    const Vector8 alphas = __builtin_shufflevector(pair, pair, 3, 3, 3, 3, 7, 7, 7, 7);
+    return pair * __builtin_shufflevector(alphas, ones, 0, 1, 2, 11, 4, 5, 6, 15);
+}
+
+/// Collects the bits in which pixels differ from opaque ones: those of alpha stay 0 while all are opaque.
+DEVICE_FUNCTION Index8 NoteAlpha(Index8 found, Vector8 pair) {
+    const Vector8 ones = {1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f};
+    return found | ((Index8)pair ^ (Index8)ones);
+}
+DEVICE_FUNCTION int FoundAllOpaque(Index8 found) { return (found[3] | found[7]) == 0; }
 
 DEVICE_FUNCTION Vector4 LoadWeighed(AnyFrame in, int format, int index) {
     const Vector4 pixel = LoadVector(in, format, index);
@@ -71,29 +85,58 @@ DEVICE_FUNCTION Vector8 WeightsOfPair(const LaneTaps* taps, int tap, int i) {
 }
 
 DEVICE_FUNCTION void PutLanes(Lanes4* lanes, const Vector4* pixels) {
-    for (int i = 0; i < LANES; i += 4) PutFour(lanes, i, pixels[i], pixels[i + 1], pixels[i + 2], pixels[i + 3]);
+#define PIXEL_OF_LANE(lane) pixels[lane]
+    FILL_LANES(lanes, PIXEL_OF_LANE);
+#undef PIXEL_OF_LANE
 }
 
 /// All taps of all lanes lie inside the region.
-DEVICE_FUNCTION void SampleInside(Lanes4* sum, AnyFrame in, int format, Region region, const LaneTaps* across,
-                                  int pairs, const LaneTaps* down, int rows) {
+/// @param weigh 0: the pixels are taken as they are, and the result tells whether that was right: all are opaque
+DEVICE_FUNCTION int SampleInside(Lanes4* sum, AnyFrame in, int format, Region region, const LaneTaps* across, int pairs,
+                                 const LaneTaps* down, int rows, int weigh) {
     const std::ptrdiff_t rowBytes = static_cast<std::ptrdiff_t>(region.pitch) * PixelBytes(format);
     int index[LANES];
     Vector4 pixels[LANES];
+    Index8 found = {};
     EACH_LANE(i) index[i] = (region.top + down->first[i]) * region.pitch + region.left + across->first[i];
     for (int i = 0; i < LANES; ++i) {
         const uchar* corner = PixelAddress(in, format, index[i]);
-        Vector8 total = {};
+        Vector4 total = {};
         for (int k = 0; k < pairs; ++k) {
             const uchar* address = corner + 2 * k * PixelBytes(format);
             Vector8 column = {};
-            for (int j = 0; j < rows; ++j)
-                column += LoadWeighedPair(address + j * rowBytes, format) * down->weight[j][i];
-            total += column * WeightsOfPair(across, 2 * k, i);
+            for (int j = 0; j < rows; ++j) {
+                const Vector8 pair = LoadPair(address + j * rowBytes, format);
+                if (weigh == 0) found = NoteAlpha(found, pair);
+                column += (weigh == 0 ? pair : WeighPair(pair)) * down->weight[j][i];
+            }
+            total += LowHalf(column) * across->weight[2 * k][i];
+            total += HighHalf(column) * across->weight[2 * k + 1][i];
         }
-        pixels[i] = AddHalves(total);
+        pixels[i] = total;
     }
+    if (weigh == 0 && !FoundAllOpaque(found)) return 0;
     PutLanes(sum, pixels);
+    if (weigh == 0) EACH_LANE(i) sum->w[i] = 1.0f;
+    return weigh == 0;
+}
+
+/// The commonest sizes with their bounds known, so that their loops are unrolled.
+DEVICE_FUNCTION int SampleInsideBySize(Lanes4* sum, AnyFrame in, int format, Region region, const LaneTaps* across,
+                                       int columns, const LaneTaps* down, int rows, int weigh) {
+    if (columns == 4 && rows == 4) return SampleInside(sum, in, format, region, across, 2, down, 4, weigh);
+    if (columns == 2 && rows == 2) return SampleInside(sum, in, format, region, across, 1, down, 2, weigh);
+    return SampleInside(sum, in, format, region, across, columns / 2, down, rows, weigh);
+}
+
+/// Is it worth trying without weights? Asks the first and the last lane. (Filters that reach further gain nothing.)
+DEVICE_FUNCTION int LooksOpaque(AnyFrame in, int format, Region region, const LaneTaps* across, const LaneTaps* down) {
+    int opaque = 1;
+    for (int i = 0; i < LANES; i += LANES - 1) {
+        const int index = (region.top + down->first[i]) * region.pitch + region.left + across->first[i];
+        opaque &= LoadVector(in, format, index)[3] == 1.0f;
+    }
+    return opaque;
 }
 
 /// Positions along a line or a slanted one are in order: the outermost lanes are the extremes.
@@ -102,25 +145,22 @@ DEVICE_FUNCTION int TapsLieInside(const LaneTaps* taps, int count, int size) {
     return MinInt(a, b) >= 0 && MaxInt(a, b) + count <= size;
 }
 
-DEVICE_FUNCTION void SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across,
-                                    Reach down, const float* u, const float* v) {
+DEVICE_FUNCTION int SampleFiltered(Lanes4* sum, AnyFrame in, int format, Region region, int filter, Reach across,
+                                   Reach down, const float* u, const float* v) {
     const int columns = (across.taps + 1) & ~1;
     LaneTaps tapsAcross, tapsDown;
     if (columns <= MOST_TAPS && down.taps <= MOST_TAPS) {
         WeighTaps(&tapsAcross, filter, across, columns, u);
         WeighTaps(&tapsDown, filter, down, down.taps, v);
         if (TapsLieInside(&tapsAcross, columns, region.width) && TapsLieInside(&tapsDown, down.taps, region.height)) {
-            // The two commonest sizes with their bounds known, so that their loops are unrolled.
-            if (columns == 4 && down.taps == 4)
-                SampleInside(sum, in, format, region, &tapsAcross, 2, &tapsDown, 4);
-            else if (columns == 2 && down.taps == 2)
-                SampleInside(sum, in, format, region, &tapsAcross, 1, &tapsDown, 2);
-            else
-                SampleInside(sum, in, format, region, &tapsAcross, columns / 2, &tapsDown, down.taps);
-            return;
+            if (columns <= 4 && LooksOpaque(in, format, region, &tapsAcross, &tapsDown) &&
+                SampleInsideBySize(sum, in, format, region, &tapsAcross, columns, &tapsDown, down.taps, 0))
+                return 1;
+            return SampleInsideBySize(sum, in, format, region, &tapsAcross, columns, &tapsDown, down.taps, 1);
         }
     }
     SampleTaps(sum, in, format, region, filter, across, down, u, v);
+    return 0;
 }
 
 /// A part of the region, premultiplied; where it goes beyond the region the border goes on.
@@ -128,22 +168,31 @@ typedef struct Tile {
     int low, columns;  // its first column, and how many
     int top;           // its first row
     int pairs;         // of taps across; 0 when the part is too large to be held
+    int opaque;        // all of it
     int first[LANES];
     Vector8 weights[LANES][MOST_TAPS / 2];
     Vector4 pixels[MOST_TILE_PIXELS];
 } Tile;
 
-DEVICE_FUNCTION void FillTileRow(Vector4* row, AnyFrame in, int format, Region region, int line, int low, int columns) {
+DEVICE_FUNCTION Index8 FillTileRow(Vector4* row, AnyFrame in, int format, Region region, int line, int low, int columns,
+                                   std::ptrdiff_t ahead, Index8 found) {
     const int from = ClampInt(low, 0, region.width - 1), to = ClampInt(low + columns, from + 1, region.width);
     const uchar* address = PixelAddress(in, format, line + from);
+    const Vector8 ones = {1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f, 1.0f};
     int column = from - low;
     for (; column + 1 < to - low; column += 2, address += 2 * PixelBytes(format)) {
-        const Vector8 pair = LoadWeighedPair(address, format);
-        __builtin_memcpy(&row[column], &pair, sizeof pair);
+        __builtin_prefetch(address + ahead);
+        const Vector8 pair = LoadPair(address, format), weighed = WeighPair(pair);
+        found = NoteAlpha(found, pair);
+        __builtin_memcpy(&row[column], &weighed, sizeof weighed);
     }
-    if (column < to - low) row[column] = LoadWeighed(in, format, line + low + column);
+    if (column < to - low) {
+        row[column] = LoadWeighed(in, format, line + low + column);
+        found = NoteAlpha(found, LoadVector(in, format, line + low + column)[3] == 1.0f ? ones : Vector8{});
+    }
     for (int c = 0; c < from - low; ++c) row[c] = row[from - low];
     for (int c = to - low; c < columns; ++c) row[c] = row[to - low - 1];
+    return found;
 }
 
 DEVICE_FUNCTION void BeginTile(Tile* tile, AnyFrame in, int format, Region region, int filter, Reach across, Reach down,
@@ -151,7 +200,7 @@ DEVICE_FUNCTION void BeginTile(Tile* tile, AnyFrame in, int format, Region regio
     const int taps = (across.taps + 1) & ~1;
     const int low = FirstTap(across, Min(u[0], u[LANES - 1])), high = FirstTap(across, Max(u[0], u[LANES - 1])) + taps;
     const int top = FirstTap(down, Min(firstV, lastV)), bottom = FirstTap(down, Max(firstV, lastV)) + down.taps;
-    const int columns = (high - low + 1) & ~1;
+    const int columns = (high - low + 3) & ~3;
     tile->pairs = 0;
     if (taps > MOST_TAPS || down.taps > MOST_TAPS || columns > MOST_TILE_COLUMNS || low >= region.width || high <= 0)
         return;
@@ -165,10 +214,14 @@ DEVICE_FUNCTION void BeginTile(Tile* tile, AnyFrame in, int format, Region regio
     EACH_LANE(i) tile->first[i] = lanes.first[i] - low;
     for (int i = 0; i < LANES; ++i)
         for (int k = 0; k < taps / 2; ++k) tile->weights[i][k] = WeightsOfPair(&lanes, 2 * k, i);
+    Index8 found = {};
+    const std::ptrdiff_t rowBytes = static_cast<std::ptrdiff_t>(region.pitch) * PixelBytes(format);
     for (int row = top; row < bottom; ++row) {
         const int line = (region.top + ClampInt(row, 0, region.height - 1)) * region.pitch + region.left;
-        FillTileRow(&tile->pixels[(row - top) * columns], in, format, region, line, low, columns);
+        found = FillTileRow(&tile->pixels[(row - top) * columns], in, format, region, line, low, columns,
+                            row + 2 < bottom ? 2 * rowBytes : 0, found);
     }
+    tile->opaque = FoundAllOpaque(found);
 }
 
 /// Sums down the tile's columns.
@@ -183,12 +236,12 @@ DEVICE_FUNCTION void SumColumns(Vector4* sums, const Tile* tile, int filter, Rea
     if (down.stretch > 1.0f)
         for (int j = 0; j < taps; ++j) weights[j] /= total;
     const Vector4* corner = &tile->pixels[(first - tile->top) * tile->columns];
-    for (int c = 0; c < tile->columns; c += 2) {
-        Vector8 sum = {};
+    for (int c = 0; c < tile->columns; c += 4) {
+        Vector16 sum = {};
         for (int j = 0; j < taps; ++j) {
-            Vector8 pair;
-            __builtin_memcpy(&pair, corner + j * tile->columns + c, sizeof pair);
-            sum += pair * weights[j];
+            Vector16 four;
+            __builtin_memcpy(&four, corner + j * tile->columns + c, sizeof four);
+            sum += four * weights[j];
         }
         __builtin_memcpy(&sums[c], &sum, sizeof sum);
     }
@@ -207,25 +260,31 @@ DEVICE_FUNCTION void SumPairs(Vector4* pixels, const Vector4* columns, const Til
     }
 }
 
-DEVICE_FUNCTION void SampleTileLine(Lanes4* sum, const Tile* tile, AnyFrame in, int format, Region region, int filter,
-                                    Reach across, Reach down, const float* u, const float* v) {
+DEVICE_FUNCTION int SampleTileLine(Lanes4* sum, const Tile* tile, AnyFrame in, int format, Region region, int filter,
+                                   Reach across, Reach down, const float* u, const float* v) {
     if (tile->pairs == 0) {
         SampleTaps(sum, in, format, region, filter, across, down, u, v);
-        return;
+        return 0;
     }
     Vector4 columns[MOST_TILE_COLUMNS], pixels[LANES];
-    // The commonest sizes with their bounds known, so that the loops over taps are unrolled.
+    // The commonest sizes, a halved picture's among them, with their bounds known: the loops over taps are unrolled.
     if (down.taps == 4)
         SumColumns(columns, tile, filter, down, v[0], 4);
     else if (down.taps == 2)
         SumColumns(columns, tile, filter, down, v[0], 2);
+    else if (down.taps == 9)
+        SumColumns(columns, tile, filter, down, v[0], 9);
     else
         SumColumns(columns, tile, filter, down, v[0], down.taps);
     if (tile->pairs == 2)
         SumPairs(pixels, columns, tile, 2);
     else if (tile->pairs == 1)
         SumPairs(pixels, columns, tile, 1);
+    else if (tile->pairs == 5)
+        SumPairs(pixels, columns, tile, 5);
     else
         SumPairs(pixels, columns, tile, tile->pairs);
     PutLanes(sum, pixels);
+    if (tile->opaque != 0) EACH_LANE(i) sum->w[i] = 1.0f;
+    return tile->opaque;
 }
