@@ -25,7 +25,12 @@ std::uint64_t RoundToClass(std::uint64_t bytes) {
 }
 
 std::uint64_t GentleShare(std::uint64_t limit) { return limit / 10 * 7; }
-std::uint64_t CacheShare(std::uint64_t limit) { return limit / 2; }
+
+// Staged pictures are soon made again, and a film seldom asks for one twice: a large cache of them would let it run
+// through fresh pages, which cost more than the copies into them, for minutes.
+std::uint64_t CacheShare(MemoryPool::Kind kind, std::uint64_t limit) {
+    return kind == MemoryPool::Kind::kDevice ? limit / 2 : limit / 16;
+}
 
 }  // namespace
 
@@ -164,7 +169,7 @@ void MemoryPool::SetAllocationFilter(boost::function<bool(std::uint64_t bytes)> 
 }
 
 void MemoryPool::SetLimit(std::uint64_t bytes) {
-    mCache.SetBound(CacheShare(bytes));
+    mCache.SetBound(CacheShare(mKind, bytes));
     std::vector<Block> released;
     {
         const std::lock_guard<std::mutex> lock(mMutex);
