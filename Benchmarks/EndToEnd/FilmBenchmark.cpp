@@ -1,7 +1,7 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-// Renders a cut of H.264 clips without effects, and decodes the same clips alone, in turn and in one run: the ratio
-// says what the road from the decoder to the finished picture costs, whatever else the machine is doing.
+// Renders films of H.264 clips, and decodes the same clips alone, in turn and in one run: the ratio says what the road
+// from the decoder to the finished picture costs, whatever else the machine is doing. A film is a row of kFilms.
 #include <algorithm>
 #include <chrono>
 #include <cstdio>
@@ -19,6 +19,10 @@
 #include "Host/Output/FrameWriter.h"
 #include "Host/Session/RenderSession.h"
 
+extern "C" {
+#include <libavutil/log.h>
+}
+
 namespace {
 
 using namespace Vantrel;
@@ -29,7 +33,7 @@ constexpr std::int32_t kWidth = 1920;
 constexpr std::int32_t kHeight = 1080;
 constexpr int kRate = 25;
 constexpr int kClipFrames = 100;
-constexpr int kRounds = 5;
+constexpr int kRounds = 3;
 const std::vector<std::string> kSources = {"testsrc2", "gradients=n=4:seed=3",
                                            "mandelbrot=start_scale=2:end_scale=0.1"};
 
@@ -55,23 +59,102 @@ void MakeClip(const std::string& path, const std::string& source) {
 
 Json Time(int frames) { return {{"OTIO_SCHEMA", "RationalTime.1"}, {"rate", kRate}, {"value", frames}}; }
 
-Json Range(int frames) { return {{"OTIO_SCHEMA", "TimeRange.1"}, {"start_time", Time(0)}, {"duration", Time(frames)}}; }
+Json Range(int first, int frames) {
+    return {{"OTIO_SCHEMA", "TimeRange.1"}, {"start_time", Time(first)}, {"duration", Time(frames)}};
+}
 
-void WriteTimeline(const std::string& folder) {
+/// A clip of the source from its first frame on.
+Json Clip(const std::string& folder, std::size_t source, int first, int frames) {
+    const Json media = {{"OTIO_SCHEMA", "ExternalReference.1"},
+                        {"target_url", std::filesystem::path(ClipPath(folder, source)).filename().string()},
+                        {"available_range", Range(0, kClipFrames)}};
+    return {{"OTIO_SCHEMA", "Clip.1"},
+            {"name", kSources[source]},
+            {"source_range", Range(first, frames)},
+            {"media_reference", media}};
+}
+
+Json Track(const Json& items) { return {{"OTIO_SCHEMA", "Track.1"}, {"kind", "Video"}, {"children", items}}; }
+
+/// The clips one after the other, each of the same length.
+Json Cut(const std::string& folder, int first, int frames) {
     Json clips = Json::array();
-    for (std::size_t i = 0; i < kSources.size(); ++i) {
-        const Json media = {{"OTIO_SCHEMA", "ExternalReference.1"},
-                            {"target_url", std::filesystem::path(ClipPath(folder, i)).filename().string()},
-                            {"available_range", Range(kClipFrames)}};
-        clips.push_back({{"OTIO_SCHEMA", "Clip.1"},
-                         {"name", kSources[i]},
-                         {"source_range", Range(kClipFrames)},
-                         {"media_reference", media}});
+    for (std::size_t i = 0; i < kSources.size(); ++i) clips.push_back(Clip(folder, i, first, frames));
+    return clips;
+}
+
+Json PlainCut(const std::string& folder) { return Json::array({Track(Cut(folder, 0, kClipFrames))}); }
+
+/// About half of the frames are part of a dissolve.
+Json Dissolves(const std::string& folder) {
+    constexpr int kHandle = 25;
+    Json items = Json::array();
+    for (const Json& clip : Cut(folder, kHandle, kClipFrames - 2 * kHandle)) {
+        if (!items.empty()) {
+            items.push_back({{"OTIO_SCHEMA", "Transition.1"},
+                             {"transition_type", "SMPTE_Dissolve"},
+                             {"in_offset", Time(kHandle)},
+                             {"out_offset", Time(kHandle)}});
+        }
+        items.push_back(clip);
     }
-    const Json track = {{"OTIO_SCHEMA", "Track.1"}, {"kind", "Video"}, {"children", clips}};
+    return Json::array({Track(items)});
+}
+
+Json Nested(const std::string& folder) {
+    const Json stack = {{"OTIO_SCHEMA", "Stack.1"}, {"name", "inner"}, {"children", PlainCut(folder)}};
+    return Json::array({Track(Json::array({stack}))});
+}
+
+Json Adjusted(const std::string& folder) {
+    const Json generator = {
+        {"OTIO_SCHEMA", "GeneratorReference.1"}, {"generator_kind", "adjustment"}, {"parameters", Json::object()}};
+    const Json invert = {{"OTIO_SCHEMA", "Effect.1"}, {"effect_name", "TQ.XQVE Invert"}};
+    const Json layer = {{"OTIO_SCHEMA", "Clip.1"},
+                        {"name", "adjustment"},
+                        {"source_range", Range(0, static_cast<int>(kSources.size()) * kClipFrames)},
+                        {"media_reference", generator},
+                        {"effects", Json::array({invert})}};
+    return Json::array({Track(Cut(folder, 0, kClipFrames)), Track(Json::array({layer}))});
+}
+
+/// The clips at half speed, with the frames between made of their neighbours.
+Json Blended(const std::string& folder) {
+    Json clips = Cut(folder, 0, kClipFrames);
+    for (Json& clip : clips) {
+        clip["effects"] = Json::array({{{"OTIO_SCHEMA", "LinearTimeWarp.1"}, {"time_scalar", 0.5}}});
+        clip["metadata"] = {{"vantrel", {{"frame_blend", true}}}};
+    }
+    return Json::array({Track(clips)});
+}
+
+Json TwoLayers(const std::string& folder) {
+    Json upper = Cut(folder, 0, kClipFrames);
+    for (Json& clip : upper) {
+        const Json values = {{"position", {0.7, 0.3}}, {"scale", 50.0}, {"rotation", 5.0}};
+        const Json motion = {{"OTIO_SCHEMA", "Effect.1"},
+                             {"effect_name", "TQ.XQVE Motion"},
+                             {"metadata", {{"vantrel", {{"params", values}}}}}};
+        clip["effects"] = Json::array({motion});
+    }
+    return Json::array({Track(Cut(folder, 0, kClipFrames)), Track(upper)});
+}
+
+struct Film {
+    const char* name;
+    Json (*tracks)(const std::string& folder);
+};
+constexpr Film kFilms[] = {
+    {"cut", &PlainCut},      {"dissolves", &Dissolves},  {"nested cut", &Nested},
+    {"adjusted", &Adjusted}, {"time-blended", &Blended}, {"picture in picture", &TwoLayers},
+};
+
+std::string TimelinePath(const std::string& folder, const Film& film) { return folder + "/" + film.name + ".otio"; }
+
+void WriteTimeline(const std::string& folder, const Film& film) {
     const Json timeline = {{"OTIO_SCHEMA", "Timeline.1"},
-                           {"tracks", {{"OTIO_SCHEMA", "Stack.1"}, {"children", {track}}}}};
-    std::ofstream(folder + "/cut.otio") << timeline.dump(1);
+                           {"tracks", {{"OTIO_SCHEMA", "Stack.1"}, {"children", film.tracks(folder)}}}};
+    std::ofstream(TimelinePath(folder, film)) << timeline.dump(1);
 }
 
 /// Frames a second of decoding the clips one after the other, with all the threads that FFmpeg likes.
@@ -84,9 +167,9 @@ double DecodeAlone(const std::string& folder) {
     return static_cast<double>(kSources.size() * kClipFrames) / SecondsSince(start);
 }
 
-Host::RenderSummary RenderCut(const std::string& folder, Host::DeviceChoice device, std::uint32_t quality) {
+Host::RenderSummary Render(const std::string& file, Host::DeviceChoice device, std::uint32_t quality) {
     Host::SessionOptions options;
-    options.file = folder + "/cut.otio";
+    options.file = file;
     options.device = device;
     Host::RenderSession session(options);
     Host::RenderJob job;
@@ -104,43 +187,65 @@ double Median(std::vector<double> values) {
     return values[values.size() / 2];
 }
 
-void Compare(const std::string& folder, const char* name, Host::DeviceChoice device, std::uint32_t quality) {
-    std::vector<double> ratios;
-    std::vector<double> rates;
-    std::vector<double> decodes;
-    std::vector<double> waits;
-    for (int round = 0; round < kRounds; ++round) {
-        const double decode = DecodeAlone(folder);
-        const Host::RenderSummary summary = RenderCut(folder, device, quality);
-        const double rate = static_cast<double>(summary.frames) / summary.seconds;
-        ratios.push_back(rate / decode);
-        rates.push_back(rate);
-        decodes.push_back(decode);
-        waits.push_back(summary.waitSeconds / summary.seconds);
+struct Case {
+    const Film& film;
+    const char* deviceName;
+    Host::DeviceChoice device;
+    std::uint32_t quality;
+    std::vector<double> ratios, rates, decodes, waits;
+    Host::RenderSummary last;
+};
+
+std::vector<Case> MakeCases() {
+    std::vector<Case> cases;
+    for (const Film& film : kFilms) {
+        const bool plain = &film == &kFilms[0];
+        cases.push_back({film, "CUDA", Host::DeviceChoice::kCuda, 4, {}, {}, {}, {}, {}});
+        if (plain) cases.push_back({film, "CUDA", Host::DeviceChoice::kCuda, 1, {}, {}, {}, {}, {}});
+        cases.push_back({film, "OpenCL", Host::DeviceChoice::kOpenCL, 4, {}, {}, {}, {}, {}});
     }
-    std::printf("| %s, quality %u | %.0f | %.0f | %.2f | %.0f %% |\n", name, quality, Median(decodes), Median(rates),
-                Median(ratios), 100 * Median(waits));
+    return cases;
+}
+
+void Measure(const std::string& folder, Case& each) {
+    const double decode = DecodeAlone(folder);
+    each.last = Render(TimelinePath(folder, each.film), each.device, each.quality);
+    const double rate = static_cast<double>(each.last.frames) / each.last.seconds;
+    each.ratios.push_back(rate / decode);
+    each.rates.push_back(rate);
+    each.decodes.push_back(decode);
+    each.waits.push_back(each.last.waitSeconds / each.last.seconds);
+}
+
+void Print(const Case& each) {
+    std::printf("| %s, %s, quality %u | %.0f | %.0f | %.2f | %.0f %% | %lld |\n", each.film.name, each.deviceName,
+                each.quality, Median(each.decodes), Median(each.rates), Median(each.ratios), 100 * Median(each.waits),
+                static_cast<long long>(each.last.frames - each.last.deviceFrames));
 }
 
 }  // namespace
 
 int main(int argc, char** argv) {
-    if (argc != 2) {
-        std::cerr << "usage: vantrel_film_benchmark FOLDER\n";
+    if (argc != 2 && argc != 3) {
+        std::cerr << "usage: vantrel_film_benchmark FOLDER [ROUNDS]\n";
         return 1;
     }
     try {
         const std::string folder = argv[1];
+        const int rounds = argc == 3 ? std::max(1, std::stoi(argv[2])) : kRounds;
         std::filesystem::create_directories(folder);
+        av_log_set_level(AV_LOG_WARNING);
         for (std::size_t i = 0; i < kSources.size(); ++i) MakeClip(ClipPath(folder, i), kSources[i]);
-        WriteTimeline(folder);
+        for (const Film& film : kFilms) WriteTimeline(folder, film);
+        std::vector<Case> cases = MakeCases();
+        for (int round = 0; round < rounds; ++round) {
+            for (Case& each : cases) Measure(folder, each);
+        }
         std::printf(
-            "| cut of 1080p H.264, no effects | decode alone, fps | render, fps | render / decode | waited for media "
-            "|\n");
-        std::printf("|---|---|---|---|---|\n");
-        Compare(folder, "CUDA (CPU driver)", Host::DeviceChoice::kCuda, 4);
-        Compare(folder, "CUDA (CPU driver)", Host::DeviceChoice::kCuda, 1);
-        Compare(folder, "OpenCL", Host::DeviceChoice::kOpenCL, 4);
+            "| 1080p H.264 films | decode alone, fps | render, fps | render / decode | waited for media | "
+            "not the device's |\n");
+        std::printf("|---|---|---|---|---|---|\n");
+        for (const Case& each : cases) Print(each);
         return 0;
     } catch (const std::exception& error) {
         std::cerr << "vantrel_film_benchmark: " << error.what() << "\n";
