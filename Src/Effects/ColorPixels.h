@@ -15,6 +15,18 @@ DEVICE_FUNCTION float SmoothRamp(float low, float high, float x) {
     return span > 0.0f ? t * t * (3.0f - 2.0f * t) : (x < low ? 0.0f : 1.0f);
 }
 
+/// Input levels, gamma, output levels; `powers` 0 where no inverse gamma differs from 1, which spares the power. Equal
+/// input levels are a step. The light case has no more to do than a product and two sums, and neutral levels keep every
+/// bit.
+DEVICE_FUNCTION float LevelsChannel(float v, int powers, float blackIn, float whiteIn, float inverseGamma,
+                                    float blackOut, float whiteOut) {
+    const float inverse = 1.0f / (whiteIn != blackIn ? whiteIn - blackIn : 1.0f);
+    const float linear = whiteIn != blackIn ? (v - blackIn) * inverse : (v < blackIn ? 0.0f : 1.0f);
+    const float exponent = inverseGamma >= 0.0f && inverseGamma <= 100.0f ? inverseGamma : 100.0f;
+    const float bent = powers != 0 && linear > 0.0f && exponent != 1.0f ? Pow(linear, exponent) : linear;
+    return whiteOut != blackOut ? blackOut + bent * (whiteOut - blackOut) : blackOut;
+}
+
 /// Shares of shadows (x), midtones (y) and highlights (z), which sum to 1.
 DEVICE_FUNCTION Float4 TonalShares(float luma, float t0, float t1, float t2, float t3) {
     const float beyondShadow = SmoothRamp(t0, t1, luma);

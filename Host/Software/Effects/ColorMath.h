@@ -25,6 +25,24 @@ namespace Vantrel::Host::Software {
     return t * t * (3.0 - 2.0 * t);
 }
 
+struct Levels {
+    double blackIn = 0.0;
+    double whiteIn = 1.0;
+    double inverseGamma = 1.0;  ///< one that isn't within 0..100 counts as 100
+    double blackOut = 0.0;
+    double whiteOut = 1.0;
+};
+/// v1 = (v - blackIn) / (whiteIn - blackIn), where the two are equal 0 below and 1 from there on;
+/// v2 = v1^inverseGamma where v1 is above 0, else v1; blackOut + v2 (whiteOut - blackOut).
+[[nodiscard]] inline double LevelsChannel(double v, const Levels& levels) {
+    const double span = levels.whiteIn - levels.blackIn;
+    const double linear = span != 0.0 ? (v - levels.blackIn) / span : (v < levels.blackIn ? 0.0 : 1.0);
+    const bool sane = levels.inverseGamma >= 0.0 && levels.inverseGamma <= 100.0;
+    const double bent = linear > 0.0 ? std::pow(linear, sane ? levels.inverseGamma : 100.0) : linear;
+    const double reach = levels.whiteOut - levels.blackOut;
+    return reach != 0.0 ? levels.blackOut + bent * reach : levels.blackOut;
+}
+
 /// Four levels: up to where all is shadow, from where nothing is, up to where nothing is highlight, from where all is.
 using TonalRange = std::array<double, 4>;
 
