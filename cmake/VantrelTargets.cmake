@@ -62,5 +62,5 @@ function(vantrel_test name)
     add_test(NAME ${name} COMMAND ${name})
     set_tests_properties(${name} PROPERTIES
         LABELS "${ARG_LABELS}" TIMEOUT ${ARG_TIMEOUT}
-        ENVIRONMENT "POCL_CACHE_DIR=${PROJECT_BINARY_DIR}/opencl-cache;KILN_CACHE_DIR=${PROJECT_BINARY_DIR}/kiln-cache;LSAN_OPTIONS=suppressions=${PROJECT_SOURCE_DIR}/cmake/lsan.supp:print_suppressions=0;TSAN_OPTIONS=second_deadlock_stack=1")
+        ENVIRONMENT "POCL_CACHE_DIR=${PROJECT_BINARY_DIR}/opencl-cache;KILN_CACHE_DIR=${PROJECT_BINARY_DIR}/kiln-cache;LSAN_OPTIONS=suppressions=${PROJECT_SOURCE_DIR}/cmake/lsan.supp:print_suppressions=0;TSAN_OPTIONS=suppressions=${PROJECT_SOURCE_DIR}/cmake/tsan.supp:second_deadlock_stack=1")
 endfunction()

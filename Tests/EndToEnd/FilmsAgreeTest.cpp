@@ -93,7 +93,10 @@ TEST_F(FilmsAgree, StructuresOnBothFrameworksAndOnTheHost) {
 
 class WithLittleMemory : public FilmsAgree {
 protected:
-    /// Three layers, of which two are drawn with motion, in a picture of 3840 by 2160.
+    static constexpr std::int32_t kHeight = VANTREL_LARGE_HEIGHT;
+    static constexpr std::int32_t kWidth = kHeight * 16 / 9;
+
+    /// Three layers, of which two are drawn with motion, in a large picture.
     WithLittleMemory() {
         WriteTestMedia({{"a.mov", 1, 8, kFrame}, {"b.mov", 700, 8, kFrame}, {"c.mov", 5000, 8, kFrame}},
                        mFolder.Path(""), [](const std::string&) {});
@@ -106,7 +109,7 @@ protected:
             Timeline({layer("a", Json::array()),
                       layer("b", {Effect("TQ.XQVE Opacity", {{"0", 80.0}}), Effect("TQ.XQVE Motion", motion)}),
                       layer("c", {Effect("TQ.XQVE Motion", {{"0", {0.7, 0.3}}, {"1", 40.0}, {"3", true}})})},
-                     Own({{"sequence", {{"width", 3840}, {"height", 2160}, {"rate", 24}}}}));
+                     Own({{"sequence", {{"width", kWidth}, {"height", kHeight}, {"rate", 24}}}}));
         std::ofstream(mFile) << timeline.dump();
         mOptions.mediaRoots = {mFolder.Path("")};
         mOptions.frames = {1};
@@ -122,7 +125,7 @@ TEST_F(WithLittleMemory, AFilmIsTheSame) {
     ASSERT_EQ(untroubled.pictures.size(), 1U);
     EXPECT_EQ(untroubled.summary.hostFrames, 0);
     FilmOptions little = mOptions;
-    little.deviceMemory = std::uint64_t{400} << 20;
+    little.deviceMemory = std::uint64_t{50} * kWidth * kHeight;  // three pictures and a little more
     const Film troubled = RenderFilm(mFile, little);
     const Difference worst = Compare(untroubled, troubled);
     EXPECT_LE(worst.levels, 1) << worst.place;
