@@ -4,12 +4,12 @@
 
 #include <algorithm>
 #include <cmath>
-#include <cstdio>
 #include <filesystem>
 #include <map>
 
 #include "Host/Media/NumberPicture.h"
 #include "Host/Output/FrameWriter.h"
+#include "Host/Time/Timecode.h"
 
 namespace Vantrel::Host {
 
@@ -59,16 +59,6 @@ void Collect(const Item& item, std::int64_t defaultTicks, std::map<std::string, 
     const std::int64_t end = std::max(known->second.firstFrame + known->second.frameCount, first + count);
     known->second.firstFrame = std::min(known->second.firstFrame, first);
     known->second.frameCount = end - known->second.firstFrame;
-}
-
-std::string TimecodeOf(std::int64_t frame, std::int64_t ticksPerFrame) {
-    const auto rate = static_cast<std::int64_t>(
-        std::llround(static_cast<double>(Vellum::kTicksPerSecond) / static_cast<double>(ticksPerFrame)));
-    char text[48];
-    std::snprintf(text, sizeof text, "%02lld:%02lld:%02lld:%02lld", static_cast<long long>(frame / rate / 3600),
-                  static_cast<long long>(frame / rate / 60 % 60), static_cast<long long>(frame / rate % 60),
-                  static_cast<long long>(frame % rate));
-    return text;
 }
 
 }  // namespace

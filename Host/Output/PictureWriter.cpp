@@ -48,21 +48,25 @@ Vellum::PixelFormat PictureWriter::GetPixelFormat() const {
     return mExr ? Vellum::kPixelFormat_BGRA_4444_32f : Vellum::kPixelFormat_BGRA_4444_8u;
 }
 
+void EncodePicture(const HostPicture& picture, const OutputFormat& format, bool exr, std::ostream& out) {
+    const AVPixelFormat pixelFormat = exr ? (format.alpha ? AV_PIX_FMT_GBRAPF32 : AV_PIX_FMT_GBRPF32)
+                                          : (format.alpha ? AV_PIX_FMT_RGBA : AV_PIX_FMT_RGB24);
+    Encoder encoder(exr ? "exr" : "png", format, pixelFormat, [exr](AVCodecContext& context, AVDictionary** options) {
+        context.time_base = {1, 25};
+        context.color_range = AVCOL_RANGE_JPEG;
+        if (exr) av_dict_set(options, "compression", "zip16", 0);
+    });
+    const auto deliver = [&](AVPacket& packet) { out.write(reinterpret_cast<const char*>(packet.data), packet.size); };
+    encoder.Encode(&picture, 0, deliver);
+    encoder.Encode(nullptr, 0, deliver);
+}
+
 void PictureWriter::Write(const HostPicture& picture, std::int64_t number) {
     OutputFormat format = mFormat;
     format.path = mName.Format(number);
     PendingFile file(format.path);
-    const AVPixelFormat pixelFormat = mExr ? (format.alpha ? AV_PIX_FMT_GBRAPF32 : AV_PIX_FMT_GBRPF32)
-                                           : (format.alpha ? AV_PIX_FMT_RGBA : AV_PIX_FMT_RGB24);
-    Encoder encoder(mExr ? "exr" : "png", format, pixelFormat, [this](AVCodecContext& context, AVDictionary** options) {
-        context.time_base = {1, 25};
-        context.color_range = AVCOL_RANGE_JPEG;
-        if (mExr) av_dict_set(options, "compression", "zip16", 0);
-    });
     std::ofstream out(file.GetWorkingPath(), std::ios::binary);
-    const auto deliver = [&](AVPacket& packet) { out.write(reinterpret_cast<const char*>(packet.data), packet.size); };
-    encoder.Encode(&picture, 0, deliver);
-    encoder.Encode(nullptr, 0, deliver);
+    EncodePicture(picture, format, mExr, out);
     out.close();
     if (!out) throw OutputError(format.path + " can't be written: the disk is full or the folder refuses it");
     file.Commit();

@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include <optional>
+#include <ostream>
 
 #include "Host/Output/Encoder.h"
 
@@ -22,6 +22,10 @@ private:
     std::string mAfter;
     int mWidth = -1;
 };
+
+/// Writes one picture as PNG or OpenEXR. `format` has the picture's size. Throws OutputError, which names the format's
+/// path.
+void EncodePicture(const HostPicture& picture, const OutputFormat& format, bool exr, std::ostream& out);
 
 /// PNG pictures of 8 bits, or OpenEXR pictures of 32-bit float with premultiplied colour, as that form has it.
 class PictureWriter : public FrameWriter {

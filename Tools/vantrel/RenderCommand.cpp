@@ -1,18 +1,15 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include <atomic>
-#include <charconv>
-#include <csignal>
 #include <cstdio>
 #include <iostream>
 #include <memory>
-#include <optional>
 
 #include "Commands.h"
 #include "Host/Output/FrameWriter.h"
 #include "Host/Render/OutputQueue.h"
-#include "Host/Session/RenderSession.h"
+#include "Interrupts.h"
 #include "Progress.h"
+#include "SessionArguments.h"
 
 namespace Vantrel::Tool {
 
@@ -22,50 +19,18 @@ using Host::RenderSession;
 using Host::RenderSummary;
 
 struct RenderArguments {
-    std::string file;
+    SessionArguments session;
     std::string output;
     std::string range;
     std::int64_t frame = -1;
     std::string size;
     std::uint32_t quality = 4;
-    std::string device = "auto";
-    std::vector<std::string> mediaRoots;
     std::string previews;
-    std::uint64_t deviceMemoryMB = 0;
     bool alpha = false;
     bool report = false;
     bool strict = false;
     bool json = false;
 };
-
-std::atomic<bool> gStop{false};
-
-void OnInterrupt(int) { gStop = true; }
-
-/// Interrupts stop the render between two frames for as long as this lives.
-class InterruptScope {
-public:
-    InterruptScope()
-        : mOldInterrupt(std::signal(SIGINT, OnInterrupt)), mOldTerminate(std::signal(SIGTERM, OnInterrupt)) {}
-    ~InterruptScope() {
-        std::signal(SIGINT, mOldInterrupt);
-        std::signal(SIGTERM, mOldTerminate);
-    }
-    InterruptScope(const InterruptScope&) = delete;
-    InterruptScope& operator=(const InterruptScope&) = delete;
-
-private:
-    void (*mOldInterrupt)(int);
-    void (*mOldTerminate)(int);
-};
-
-template <class Number>
-std::optional<Number> ParseNumber(const std::string& text) {
-    Number value{};
-    const auto result = std::from_chars(text.data(), text.data() + text.size(), value);
-    if (result.ec != std::errc() || result.ptr != text.data() + text.size()) return std::nullopt;
-    return value;
-}
 
 /// "first:end" in frames, either side may be left out.
 std::pair<std::int64_t, std::int64_t> ParseRange(const RenderArguments& arguments, std::int64_t frames) {
@@ -89,27 +54,10 @@ std::pair<std::int64_t, std::int64_t> ParseRange(const RenderArguments& argument
     return {*first, *end};
 }
 
-std::pair<std::int32_t, std::int32_t> ParseSize(const std::string& text, const Host::SequenceFormat& format) {
-    if (text.empty()) return {format.width, format.height};
-    const std::size_t cross = text.find('x');
-    const auto width = ParseNumber<std::int32_t>(text.substr(0, cross));
-    const auto height = cross == std::string::npos ? std::nullopt : ParseNumber<std::int32_t>(text.substr(cross + 1));
-    if (!width || !height || *width < 1 || *height < 1 || *width > 16384 || *height > 16384) {
-        throw UsageError("--size " + text + ": expected WIDTHxHEIGHT, each from 1 to 16384");
-    }
-    return {*width, *height};
-}
-
-Host::SessionOptions MakeSessionOptions(const RenderArguments& arguments) {
-    Host::SessionOptions options;
-    options.file = arguments.file;
-    options.snapshot.mediaRoots = arguments.mediaRoots;
+Host::SessionOptions MakeRenderOptions(const RenderArguments& arguments) {
+    Host::SessionOptions options = MakeSessionOptions(arguments.session);
     options.snapshot.previews = arguments.previews;
     options.strict = arguments.strict;
-    options.deviceMemory = arguments.deviceMemoryMB << 20;
-    options.device = arguments.device == "cuda"     ? Host::DeviceChoice::kCuda
-                     : arguments.device == "opencl" ? Host::DeviceChoice::kOpenCL
-                                                    : Host::DeviceChoice::kAuto;
     return options;
 }
 
@@ -142,11 +90,11 @@ void PrintSummary(const RenderSession& session, const RenderSummary& summary, co
 }
 
 int Render(const RenderArguments& arguments) {
-    RenderSession session(MakeSessionOptions(arguments));
+    RenderSession session(MakeRenderOptions(arguments));
     for (const std::string& warning : session.GetSnapshot().warnings) std::cerr << "warning: " << warning << "\n";
     const Host::SequenceFormat& sequence = session.GetSequence().format;
     const auto [first, end] = ParseRange(arguments, session.GetFrameCount());
-    if (end <= first) throw UsageError(arguments.file + ": the sequence is empty");
+    if (end <= first) throw UsageError(arguments.session.file + ": the sequence is empty");
     const auto [width, height] = ParseSize(arguments.size, sequence);
 
     Host::OutputFormat format;
@@ -185,7 +133,7 @@ int Render(const RenderArguments& arguments) {
                 queue.Push(std::move(frame));
                 progress.Advance(done);
             },
-            gStop);
+            interrupts.GetStop());
         queue.Finish();
     }
     progress.End();
@@ -205,7 +153,7 @@ int Render(const RenderArguments& arguments) {
 void AddRenderCommand(CLI::App& app, int& status) {
     CLI::App* command = app.add_subcommand("render", "Render a timeline to a film or to pictures");
     const auto arguments = std::make_shared<RenderArguments>();
-    command->add_option("file", arguments->file, "OpenTimelineIO file")->required();
+    AddSessionArguments(*command, arguments->session);
     command->add_option("-o,--output", arguments->output, "FILE.(mp4|mov|mkv|png|exr); pictures take a %d or %0Nd")
         ->required();
     command->add_option("--range", arguments->range, "FIRST:END in frames, half open");
@@ -213,9 +161,6 @@ void AddRenderCommand(CLI::App& app, int& status) {
     command->add_option("--size", arguments->size, "WIDTHxHEIGHT of the output, the sequence's if not given");
     command->add_option("--quality", arguments->quality, "1 (draft, half float on CUDA) to 4 (best)")
         ->check(CLI::Range(1, 4));
-    command->add_option("--device", arguments->device)->check(CLI::IsMember({"auto", "cuda", "opencl"}));
-    command->add_option("--device-memory", arguments->deviceMemoryMB, "Use at most this many megabytes of it");
-    command->add_option("--media-root", arguments->mediaRoots, "Folder to look for media in, by name; may be repeated");
     command->add_option("--previews", arguments->previews, "Folder of rendered previews");
     command->add_flag("--alpha", arguments->alpha, "Keep the alpha channel (pictures)");
     command->add_flag("--report", arguments->report, "Print the engine's report for each frame");

@@ -7,8 +7,8 @@
 #include "Commands.h"
 #include "Host/Inspect/SegmentsJson.h"
 #include "Host/Media/FFmpegProbe.h"
-#include "Host/Session/RenderSession.h"
 #include "Host/Timeline/OtioReader.h"
+#include "SessionArguments.h"
 
 namespace Vantrel::Tool {
 
@@ -34,12 +34,7 @@ void PrintDescription(const SegmentsArguments& arguments) {
 }
 
 void PrintWithVerdicts(const SegmentsArguments& arguments) {
-    Host::SessionOptions options;
-    options.file = arguments.file;
-    options.snapshot.mediaRoots = arguments.mediaRoots;
-    if (arguments.device == "cuda") options.device = Host::DeviceChoice::kCuda;
-    if (arguments.device == "opencl") options.device = Host::DeviceChoice::kOpenCL;
-    Host::RenderSession session(options);
+    Host::RenderSession session(MakeSessionOptions({arguments.file, arguments.device, arguments.mediaRoots}));
     Print(session.GetSnapshot(), [&](std::int64_t time) -> std::optional<SegmentInfo> {
         SegmentInfo info;
         if (session.GetSystem().GetSegmentInfo(time, info, false) != 0) return std::nullopt;
