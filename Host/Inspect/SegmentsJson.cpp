@@ -119,12 +119,7 @@ Json SequenceToJson(const Sequence& sequence, const VerdictLookup& verdict) {
     Json json{{"timelineID", sequence.timelineID},
               {"path", sequence.path},
               {"name", sequence.name},
-              {"format",
-               {{"width", format.width},
-                {"height", format.height},
-                {"aspect", {format.aspectNumerator, format.aspectDenominator}},
-                {"frameTicks", format.frameTicks},
-                {"fields", static_cast<std::uint32_t>(format.fieldType)}}},
+              {"format", FormatToJson(format)},
               {"length", times.Time(sequence.length)},
               {"hash", sequence.plain.hash.ToString()},
               {"segments", Json::array()}};
@@ -140,6 +135,14 @@ Json SequenceToJson(const Sequence& sequence, const VerdictLookup& verdict) {
 }
 
 }  // namespace
+
+Json FormatToJson(const SequenceFormat& format) {
+    return {{"width", format.width},
+            {"height", format.height},
+            {"aspect", {format.aspectNumerator, format.aspectDenominator}},
+            {"frameTicks", format.frameTicks},
+            {"fields", static_cast<std::uint32_t>(format.fieldType)}};
+}
 
 Json SegmentsToJson(const Snapshot& snapshot, const VerdictLookup& verdict) {
     Json json{{"sequences", Json::array()}};

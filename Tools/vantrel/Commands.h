@@ -22,6 +22,7 @@ public:
 
 /// Each adds its subcommand; when that was called, `status` holds its outcome after the parse.
 void AddRenderCommand(CLI::App& app, int& status);
+void AddInspectCommand(CLI::App& app, int& status);
 void AddSegmentsCommand(CLI::App& app, int& status);
 void AddMediaCommand(CLI::App& app, int& status);
 void AddDevicesCommand(CLI::App& app, int& status);

@@ -31,6 +31,7 @@ int Run(int argc, char** argv) {
     app.require_subcommand(1);
     int status = Tool::kExit_Done;
     Tool::AddRenderCommand(app, status);
+    Tool::AddInspectCommand(app, status);
     Tool::AddSegmentsCommand(app, status);
     Tool::AddMediaCommand(app, status);
     Tool::AddDevicesCommand(app, status);

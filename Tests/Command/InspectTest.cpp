@@ -1,0 +1,166 @@
+// SPDX-FileCopyrightText: The Vantrel contributors
+// SPDX-License-Identifier: Apache-2.0
+// The inspection of a sequence, as people and programs get it: text, JSON, a page in a browser.
+#include <gmock/gmock.h>
+#include <gtest/gtest.h>
+
+#include <tuple>
+
+#include "Tests/Command/Browser.h"
+#include "Tests/Command/CommandFixture.h"
+
+namespace Vantrel::Host::Test {
+namespace {
+
+using testing::AllOf;
+using testing::HasSubstr;
+using testing::Not;
+
+const Json kSmall = Own({{"sequence", {{"width", 320}, {"height", 180}, {"rate", 24}}}});
+
+Json Pattern(const std::string& name, double frames, std::vector<Json> effects = {}) {
+    return Clip(name, Range(0, frames), GeneratorOf("testsrc2"), Effects(std::move(effects)));
+}
+Json Offline(double frames) { return Clip("holiday", Range(0, frames), File("missing.mov", 0, 100)); }
+
+class Inspect : public Command {
+protected:
+    /// Device, partly host, host, a gap, and the device again: 24 frames each, the last two 12.
+    std::string WriteMixed() {
+        return Write("mixed.otio", Timeline({Track({Pattern("clean", 24, {Effect("TQ.XQVE Invert")}),
+                                                    Pattern("magic", 24, {Effect("Sparkle"), Effect("TQ.XQVE Invert")}),
+                                                    Offline(24), Gap(12), Pattern("end", 12)})},
+                                            kSmall));
+    }
+    std::vector<Json> Stretches(const std::vector<Json>& items, const std::string& arguments = "") {
+        const std::string file = Write("case.otio", Timeline({Track(items)}, kSmall));
+        return Json::parse(Run("inspect --json " + file + " " + arguments).out)["stretches"];
+    }
+};
+
+TEST_F(Inspect, JsonTellsEveryStretchAndItsReasonAsTheSchemaSays) {
+    const Outcome outcome = Run("inspect --json " + WriteMixed());
+    EXPECT_EQ(outcome.status, 2);
+    EXPECT_THAT(outcome.err, HasSubstr("missing.mov"));
+    const Json json = Json::parse(outcome.out);
+    const char* const renderings[] = {"device", "partly host", "host", "gap", "device"};
+    const char* const reasons[] = {"", "no device version of the effect 'Sparkle'", "media offline: holiday", "", ""};
+    ASSERT_EQ(json["stretches"].size(), 5U);
+    for (std::size_t i = 0; i < 5; ++i) {
+        const Json& stretch = json["stretches"][i];
+        EXPECT_EQ(stretch["rendering"], renderings[i]);
+        EXPECT_EQ(stretch["reasons"].empty(), reasons[i][0] == '\0') << stretch;
+        EXPECT_THAT(stretch["reasons"].dump(), HasSubstr(reasons[i]));
+    }
+    EXPECT_EQ(json["stretches"][2]["end"]["timecode"], "00:00:03:00");
+    EXPECT_EQ(json["stretches"][0]["counters"]["effects"], 1);
+    EXPECT_EQ(json["frames"], Json({{"all", 96}, {"device", 36}, {"partlyHost", 24}, {"host", 24}, {"gap", 12}}));
+
+    const std::string check = "/usr/bin/python3 -m jsonschema " VANTREL_SCHEMA " -i ";
+    EXPECT_EQ(std::system((check + Write("good.json", outcome.out)).c_str()), 0);
+    Json wrong = json;
+    wrong["stretches"][1]["rendering"] = "magic";
+    EXPECT_NE(std::system((check + Write("wrong.json", wrong.dump()) + " >/dev/null 2>&1").c_str()), 0);
+}
+
+TEST_F(Inspect, FindsTheReasonWhereverItLies) {
+    const Json dissolve = {{"OTIO_SCHEMA", "Transition.1"},
+                           {"transition_type", "Custom_Transition"},
+                           {"metadata", {{"vantrel", {{"match_name", "Curtain"}}}}},
+                           {"in_offset", Time(4)},
+                           {"out_offset", Time(4)}};
+    const Json inner = Stack({Track({Pattern("plain", 12), Pattern("magic", 12, {Effect("Sparkle")})})});
+    const auto nested = [&](const Json& more) {
+        Json item = inner;
+        item["name"] = "Scene";
+        item.update(more);
+        return item;
+    };
+    struct Case {
+        std::vector<Json> items;
+        std::size_t stretch;
+        std::string topic;
+        std::string text;
+        std::string arguments;
+    };
+    const Case cases[] = {
+        {{Pattern("a", 12), dissolve, Pattern("b", 12)}, 1, "transition", "'Curtain'", ""},
+        {{nested(Json::object())}, 1, "effect", "'Sparkle'", ""},
+        {{nested(Effects({Warp(2)}))}, 0, "speed", "speed isn't 1.0", ""},
+        {{nested(Effects({Warp(-1)}))}, 0, "speed", "backwards", ""},
+        {{Pattern("a", 12)}, 0, "limit", "frame larger than the device's memory allows", "--device-memory 1"},
+        {{Pattern("a", 12, {Effect("lavfi:hue=s=0")})}, 0, "effect", "lavfi:hue=s=0", ""},
+    };
+    for (const Case& one : cases) {
+        const std::vector<Json> stretches = Stretches(one.items, one.arguments);
+        ASSERT_GT(stretches.size(), one.stretch) << one.text;
+        const Json& stretch = stretches[one.stretch];
+        EXPECT_NE(stretch["rendering"], "gap");
+        ASSERT_FALSE(stretch["reasons"].empty()) << one.text;
+        EXPECT_EQ(stretch["reasons"][0]["topic"], one.topic) << stretch["reasons"];
+        EXPECT_THAT(stretch["reasons"][0]["text"], HasSubstr(one.text));
+    }
+}
+
+TEST_F(Inspect, TextShowsABarAndColoursOnlyATerminal) {
+    const std::string line = "inspect " + WriteMixed();
+    const Outcome piped = Run(line);
+    const std::string bar = std::string(20, 'D') + std::string(20, 'p') + std::string(20, 'h') + std::string(10, '.') +
+                            std::string(10, 'D') + "\n";
+    EXPECT_THAT(piped.out, AllOf(HasSubstr(bar), HasSubstr("|00:00:00:00"), HasSubstr("effect 'Sparkle'"),
+                                 HasSubstr("  1     24      24  00:00:01:00  00:00:02:00  partly host  no"),
+                                 HasSubstr("media offline: holiday"), Not(HasSubstr("\033["))));
+    const auto onTerminal = [&](const std::string& settings) {
+        const std::string output = Path("terminal.txt");
+        const std::string inner = settings + " " VANTREL_COMMAND " " + line + " 2>/dev/null";
+        std::ignore = std::system(("script -qec \"" + inner + "\" /dev/null >" + output + " </dev/null").c_str());
+        std::stringstream text;
+        text << std::ifstream(output).rdbuf();
+        return text.str();
+    };
+    EXPECT_THAT(onTerminal(""), HasSubstr("\033["));
+    EXPECT_THAT(onTerminal("NO_COLOR=1"), AllOf(HasSubstr("DDDD"), Not(HasSubstr("\033["))));
+}
+
+TEST_F(Inspect, SaysWhatIsWrong) {
+    const std::string file = WriteMixed();
+    const std::tuple<std::string, int, const char*> cases[] = {
+        {Path("nowhere.otio"), 1, "nowhere.otio"},
+        {file + " --size 3by4 --html " + Path("page.html"), 1, "3by4"},
+        {file + " --device abacus", 1, "abacus"},
+        {file + " --html " + Path("no/such/page.html"), 3, "no/such"},
+    };
+    for (const auto& [arguments, status, word] : cases) {
+        const Outcome outcome = Run("inspect " + arguments);
+        EXPECT_EQ(outcome.status, status) << arguments;
+        EXPECT_THAT(outcome.err, HasSubstr(word));
+    }
+    EXPECT_FALSE(std::filesystem::exists(Path("page.html")));
+}
+
+TEST_F(Inspect, PageShowsTheTreeAndReasonOfTheStretchThatIsClicked) {
+    const std::string page = Path("page.html");
+    ASSERT_EQ(Run("inspect " + WriteMixed() + " --html " + page).status, 2);
+    Browser browser(Path("profile"));
+    browser.Open("file://" + page + "#0");
+    const std::string texts = "document.getElementById('detail').textContent";
+    const std::string nodes = "[...document.querySelectorAll('.tree g')].map((g) => [g.dataset.name, g.classList[0]])";
+    EXPECT_THAT(browser.Evaluate(texts).get<std::string>(), AllOf(HasSubstr("Whole frame"), Not(HasSubstr("Sparkle"))));
+
+    browser.Click("#stretch-1");
+    EXPECT_THAT(browser.Evaluate(texts).get<std::string>(), HasSubstr("no device version of the effect 'Sparkle'"));
+    EXPECT_EQ(browser.Evaluate(nodes), Json::parse(R"([["magic", "host"], ["Sparkle", "host"], ["Invert", "device"],
+                                                       ["Layers", "device"]])"));
+    EXPECT_GT(browser.Evaluate("document.querySelector('.tree g').getBoundingClientRect().width"), 50);
+    EXPECT_EQ(browser.Evaluate("document.querySelector('#detail img').naturalWidth"), 288);
+
+    browser.Evaluate("document.getElementById('stretch-1').focus()");
+    browser.Press("ArrowRight");
+    EXPECT_THAT(browser.Evaluate(texts).get<std::string>(), HasSubstr("media offline: holiday"));
+    EXPECT_EQ(browser.Evaluate("document.activeElement.id"), "stretch-2");
+    EXPECT_EQ(browser.Evaluate("performance.getEntriesByType('resource').filter((e) => !e.name.startsWith('data:'))"),
+              Json::array());
+}
+
+}  // namespace
+}  // namespace Vantrel::Host::Test
