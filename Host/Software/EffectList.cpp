@@ -6,6 +6,7 @@
 #include "Host/Software/EffectContext.h"
 #include "Host/Software/Effects/Invert.h"
 #include "Host/Software/Effects/LumaCorrector.h"
+#include "Host/Software/Effects/PointwiseFilters.h"
 #include "Vantrel/Effects/Invert.h"
 
 /// The one place that knows which scalar function is which effect: it reads parameters and calls.
@@ -35,6 +36,21 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
     static const std::map<std::string, EffectFunction> kFunctions = {
         {"TQ.XQVE Invert", RunInvert},
         {"TQ.XQVE Luma Corrector", RunLumaCorrector},
+        {"TQ.XQVE Alpha Adjust", RunAlphaAdjust},
+        {"KL.XQVE Black & White", RunBlackAndWhite},
+        {"TQ.XQVE Brightness & Contrast 2", RunBrightnessContrast},
+        {"KL.XQVE Color Balance", RunColorBalance},
+        {"KL.XQVE Color Pass", RunColorPass},
+        {"KL.XQVE Color Replace", RunColorReplace},
+        {"KL.XQVE Edge Feather", RunEdgeFeather},
+        {"KL.XQVE Extract", RunExtract},
+        {"TQ.XQVE Fast Color Corrector", RunFastColorCorrector},
+        {"KL.XQVE Gamma Correction", RunGammaCorrection},
+        {"KL.XQVE Horizontal Flip", RunHorizontalFlip},
+        {"TQ.XQVE Noise", RunNoise},
+        {"TQ.XQVE ProcAmp", RunProcAmp},
+        {"TQ.XQVE Tint", RunTint},
+        {"KL.XQVE Vertical Flip", RunVerticalFlip},
     };
     const auto found = kFunctions.find(matchName);
     return found == kFunctions.end() ? nullptr : found->second;

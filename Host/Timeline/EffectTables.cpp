@@ -154,23 +154,6 @@ EffectTable ThreeWayColorCorrector() {
     return table.Finish();
 }
 
-EffectTable FastColorCorrector() {
-    Builder table("TQ.XQVE Fast Color Corrector");
-    AddCorrectorHead(table);
-    table.Row(6, "hue_angle", Type::kFloat)
-        .Row(7, "balance_amount", Type::kDouble)
-        .Row(8, "balance_gain", Type::kDouble)
-        .Row(9, "balance_angle", Type::kFloat)
-        .Row(11, "saturation", Type::kDouble, {100});
-    table.Rows(21, Type::kDouble,
-               {{"input_black", 0},
-                {"input_gamma", 1},
-                {"input_white", kFullScale},
-                {"output_black", 0},
-                {"output_white", kFullScale}});
-    return table.Finish();
-}
-
 /// Sixteen control points from `first` on: a straight line, and the rest unused.
 void AddCurve(Builder& table, std::int32_t first, const std::string& prefix) {
     constexpr std::int32_t kPoints = 16;
@@ -287,39 +270,6 @@ Parameter P(const char* name, Type type, ParameterValue value = {}) {
     return parameter;
 }
 
-void AddPointwise(std::vector<EffectTable>& tables) {
-    const ParameterValue black{0, 0, 0, 1};
-    const ParameterValue white{1, 1, 1, 1};
-    tables.push_back(Simple("TQ.XQVE Alpha Adjust", {P("opacity", Type::kFloat, {100}), P("ignore_alpha", Type::kBool),
-                                                     P("invert_alpha", Type::kBool), P("mask_only", Type::kBool)}));
-    tables.push_back(Simple("KL.XQVE Black & White", {}));
-    tables.push_back(
-        Simple("TQ.XQVE Brightness & Contrast 2", {P("brightness", Type::kFloat), P("contrast", Type::kFloat)}));
-    tables.push_back(
-        Simple("KL.XQVE Color Balance", {P("red", Type::kInt, {kFullScale}), P("green", Type::kInt, {kFullScale}),
-                                         P("blue", Type::kInt, {kFullScale})}));
-    tables.push_back(Simple("KL.XQVE Color Pass",
-                            {P("similarity", Type::kInt), P("reverse", Type::kInt), P("color", Type::kColor, white)}));
-    tables.push_back(Simple("KL.XQVE Color Replace",
-                            {P("similarity", Type::kInt), P("solid_colors", Type::kInt),
-                             P("target_color", Type::kColor, black), P("replace_color", Type::kColor, black)}));
-    tables.push_back(Simple("KL.XQVE Edge Feather", {P("amount", Type::kInt)}));
-    tables.push_back(
-        Simple("KL.XQVE Extract", {P("black_input", Type::kInt), P("white_input", Type::kInt, {kFullScale}),
-                                   P("softness", Type::kInt), P("invert", Type::kBool)}));
-    tables.push_back(Simple("KL.XQVE Gamma Correction", {P("gamma", Type::kInt, {10})}));
-    tables.push_back(Simple("KL.XQVE Horizontal Flip", {}));
-    tables.push_back(Simple("KL.XQVE Vertical Flip", {}));
-    tables.push_back(
-        Simple("TQ.XQVE Noise", {P("amount", Type::kFloat), P("color", Type::kBool), P("clip", Type::kBool)}, true));
-    tables.push_back(Simple("TQ.XQVE ProcAmp", {P("brightness", Type::kFloat), P("contrast", Type::kFloat, {100}),
-                                                P("hue", Type::kFloat), P("saturation", Type::kFloat, {100}),
-                                                P("split_view", Type::kBool), P("split_percent", Type::kFloat, {50})}));
-    tables.push_back(Simple("TQ.XQVE Tint", {P("map_black", Type::kColor, black), P("map_white", Type::kColor, white),
-                                             P("amount", Type::kFloat)}));
-    tables.push_back(FastColorCorrector());
-}
-
 void AddSpatial(std::vector<EffectTable>& tables) {
     tables.push_back(Simple("TQ.XQVE Basic 3D", {P("swivel", Type::kFloat), P("tilt", Type::kFloat),
                                                  P("distance", Type::kFloat), P("specular_highlight", Type::kBool)}));
@@ -364,7 +314,6 @@ EffectTable FromEngine(const EffectRow& effect) {
 std::vector<EffectTable> MakeTables() {
     std::vector<EffectTable> tables;
     for (const EffectRow* effect : kEffectTable) tables.push_back(FromEngine(*effect));
-    AddPointwise(tables);
     AddSpatial(tables);
     tables.push_back(RgbColorCorrector());
     tables.push_back(ThreeWayColorCorrector());

@@ -4,9 +4,23 @@
 
 #include <cstring>
 
+#include "Vantrel/Effects/AlphaAdjust.h"
+#include "Vantrel/Effects/BlackAndWhite.h"
+#include "Vantrel/Effects/BrightnessContrast.h"
+#include "Vantrel/Effects/ColorBalance.h"
+#include "Vantrel/Effects/ColorPass.h"
+#include "Vantrel/Effects/ColorReplace.h"
+#include "Vantrel/Effects/EdgeFeather.h"
+#include "Vantrel/Effects/Extract.h"
+#include "Vantrel/Effects/FastColorCorrector.h"
+#include "Vantrel/Effects/Flips.h"
+#include "Vantrel/Effects/GammaCorrection.h"
 #include "Vantrel/Effects/Intrinsics.h"
 #include "Vantrel/Effects/Invert.h"
 #include "Vantrel/Effects/LumaCorrector.h"
+#include "Vantrel/Effects/Noise.h"
+#include "Vantrel/Effects/ProcAmp.h"
+#include "Vantrel/Effects/Tint.h"
 
 /// The effects and their parameters as data, the one place where an index, a name or a default is told: nodes read by
 /// these indices, hosts read files and list effects by these rows. An effect is a header in Vantrel/Effects and a line
@@ -18,6 +32,21 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kOpacityEffect,
     &kInvertEffect,
     &kLumaCorrectorEffect,
+    &kAlphaAdjustEffect,
+    &kBlackAndWhiteEffect,
+    &kBrightnessContrastEffect,
+    &kColorBalanceEffect,
+    &kColorPassEffect,
+    &kColorReplaceEffect,
+    &kEdgeFeatherEffect,
+    &kExtractEffect,
+    &kFastColorCorrectorEffect,
+    &kGammaCorrectionEffect,
+    &kHorizontalFlipEffect,
+    &kNoiseEffect,
+    &kProcAmpEffect,
+    &kTintEffect,
+    &kVerticalFlipEffect,
 };
 
 /// The effect of that match name, or null.

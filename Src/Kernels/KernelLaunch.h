@@ -25,6 +25,10 @@ public:
     /// `bytes` is 4, 8 or 16. On CUDA the argument lands at the next multiple of its own size.
     void Add(const void* value, std::uint32_t bytes);
 
+    /// The arguments in order, each as PackArgument makes it.
+    template <class... Values>
+    void AddAll(const Values&... values);
+
     /// Ends the list. @return 0, kStatus_OutOfMemory or kStatus_Failure.
     [[nodiscard]] Status Finish();
 
@@ -55,6 +59,12 @@ template <class T>
     }
 }
 
+template <class... Values>
+void KernelArgs::AddAll(const Values&... values) {
+    const auto add = [this](const auto& packed) { Add(&packed, sizeof packed); };
+    (add(PackArgument(values)), ...);
+}
+
 /// Keeps a parameter out of deduction, so that arguments convert to the kernel's own types.
 template <class T>
 struct KernelParameter {
@@ -70,8 +80,7 @@ template <class... Parameters>
                                    void (&/*signature*/)(Parameters...),
                                    typename KernelParameter<Parameters>::Type... values) {
     KernelArgs args(framework, kernel);
-    const auto add = [&args](const auto& packed) { args.Add(&packed, sizeof packed); };
-    (add(PackArgument(values)), ...);
+    args.AddAll(values...);
     return args.Finish();
 }
 

@@ -12,6 +12,7 @@
 #include "Src/Filters/DisabledNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
 #include "Src/Filters/Effects/LumaCorrectorNode.h"
+#include "Src/Filters/Effects/PointwiseFilterHostNode.h"
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/IntrinsicNode.h"
 #include "Src/Filters/MediaNode.h"
@@ -56,6 +57,21 @@ constexpr RegistryEntry kEntries[] = {
     {u"DisabledNode", Make<DisabledNode>},
     {u"TQ.XQVE Invert", Make<InvertNode>},
     {u"TQ.XQVE Luma Corrector", Make<LumaCorrectorNode>},
+    {u"TQ.XQVE Alpha Adjust", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Black & White", Make<PointwiseFilterHostNode>},
+    {u"TQ.XQVE Brightness & Contrast 2", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Color Balance", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Color Pass", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Color Replace", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Edge Feather", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Extract", Make<PointwiseFilterHostNode>},
+    {u"TQ.XQVE Fast Color Corrector", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Gamma Correction", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Horizontal Flip", Make<PointwiseFilterHostNode>},
+    {u"TQ.XQVE Noise", Make<PointwiseFilterHostNode>},
+    {u"TQ.XQVE ProcAmp", Make<PointwiseFilterHostNode>},
+    {u"TQ.XQVE Tint", Make<PointwiseFilterHostNode>},
+    {u"KL.XQVE Vertical Flip", Make<PointwiseFilterHostNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

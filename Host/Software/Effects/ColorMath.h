@@ -55,9 +55,29 @@ struct TonalShares {
     return {1.0 - beyondShadow, beyondShadow - highlight, highlight};
 }
 
-/// value^(1 / gamma), and from 0 down the value itself.
+/// value^exponent, and from 0 down the value itself.
+[[nodiscard]] inline double PowerLevel(double value, double exponent) {
+    return value > 0.0 ? std::pow(value, exponent) : value;
+}
+
+/// value^(1 / gamma).
 [[nodiscard]] inline double GammaLevel(double value, double gamma) {
-    return value > 0.0 ? std::pow(value, 1.0 / std::max(gamma, 0.01)) : value;
+    return PowerLevel(value, 1.0 / std::max(gamma, 0.01));
+}
+
+/// A place on the vectorscope.
+struct ColorDifference {
+    double cb = 0.0;
+    double cr = 0.0;
+};
+[[nodiscard]] inline ColorDifference DifferenceOf(const Pixel& p) {
+    const double luma = Luma(p);
+    return {(p[0] - luma) / 1.8556, (p[2] - luma) / 1.5748};
+}
+/// The colour with that luma and those differences.
+[[nodiscard]] inline Pixel ColorOf(double luma, const ColorDifference& difference, double alpha) {
+    const double blue = luma + 1.8556 * difference.cb, red = luma + 1.5748 * difference.cr;
+    return {blue, (luma - 0.2126 * red - 0.0722 * blue) / 0.7152, red, alpha};
 }
 
 }  // namespace Vantrel::Host::Software

@@ -6,9 +6,10 @@
 
 namespace Vantrel {
 
-Status OneKernelEffect::MakeFrameLike(const VideoFrameRef& input) {
+Status MakeFrameLike(const Kiln::DeviceRef& device, const VideoFrameRef& input, VideoFrameRef& frame) {
+    if (!input) throw Ostrand::NullInterfaceException();
     const Vellum::Rect bounds = input->GetBounds();
-    return Kiln::CreateGPUVideoFrame(mFrameSlot, mDevice, input->GetPixelFormat(), bounds.Width(), bounds.Height(),
+    return Kiln::CreateGPUVideoFrame(frame, device, input->GetPixelFormat(), bounds.Width(), bounds.Height(),
                                      input->GetPixelAspectRatio(), Vellum::kFieldType_Progressive, input->GetOrigin());
 }
 

@@ -53,6 +53,9 @@ private:
     InterfaceRef<Marl::IFrameRows> mRows;
 };
 
+/// Makes a progressive frame of the input's size and attributes. A null input raises NullInterfaceException.
+[[nodiscard]] Status MakeFrameLike(const Kiln::DeviceRef& device, const VideoFrameRef& input, VideoFrameRef& frame);
+
 /// The base of effects that run one kernel over the frame of their one input. What is left to such an effect is to read
 /// its parameters, to see that it has nothing to do, and to list the kernel's arguments:
 ///
@@ -98,14 +101,12 @@ private:
     template <class LaunchFunction>
     Status RunOnNewFrame(EffectKernel& kernel, const LaunchFunction& launch, const VideoFrameRef& input) {
         const KernelFrame in(input);
-        if (Ostrand::Failed(MakeFrameLike(input))) return Ostrand::kStatus_OutOfMemory;
+        if (Ostrand::Failed(MakeFrameLike(mDevice, input, mFrameSlot))) return Ostrand::kStatus_OutOfMemory;
         const KernelFrame out(mFrameSlot);
         static_cast<void>(out.Data());
         const std::uint64_t handle = kernel.Find(mDevice);
         return handle == 0 ? Ostrand::kStatus_Failure : launch(handle, out, in);
     }
-    /// Puts a frame of the input's size and attributes into the frame slot.
-    Status MakeFrameLike(const VideoFrameRef& input);
 };
 
 }  // namespace Vantrel
