@@ -10,17 +10,16 @@
 #include "Src/Nodes/FilterNode.h"
 #include "Src/Nodes/FinishedInputs.h"
 #include "Src/Stopwatch.h"
+#include "Vellum/FieldOrder.h"
 #include "Vellum/Time.h"
 
 namespace Vantrel {
 namespace {
 
+using Vellum::IsInterlaced;
+
 constexpr std::uint32_t kLevel_EndOfFrame = 0;
 constexpr std::uint32_t kLevel_BetweenFields = 3;
-
-[[nodiscard]] bool IsInterlaced(std::uint32_t fieldType) {
-    return fieldType == Vellum::kFieldType_UpperFirst || fieldType == Vellum::kFieldType_LowerFirst;
-}
 
 [[nodiscard]] bool IsOnFrameBoundary(std::int64_t time, std::int64_t frameTicks) {
     Vellum::TickTime aligned(time);

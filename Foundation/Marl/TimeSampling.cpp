@@ -18,11 +18,25 @@ std::int64_t Align(std::int64_t time, Vellum::FrameRate rate) {
     return aligned.GetTicks();
 }
 
+/// Limited to the end of time; a speed that isn't a number counts as that of a held frame.
+std::int64_t Scale(std::int64_t ticks, double speed) {
+    const double scaled = static_cast<double>(ticks) * speed + 0.5;
+    if (!(scaled > 0.0)) return 0;
+    return scaled < static_cast<double>(Vellum::kTime_Max) ? static_cast<std::int64_t>(scaled) : Vellum::kTime_Max;
+}
+
+/// Names the fields of a frame in the order in which they are shown backwards.
+void ExchangeFields(std::vector<TimeSample>& samples, Vellum::FrameRate fieldRate) {
+    for (TimeSample& sample : samples) {
+        sample.time =
+            sample.time == sample.frameTime ? sample.frameTime + fieldRate.GetTicksPerFrame() : sample.frameTime;
+    }
+}
+
 }  // namespace
 
 TimeSpan CalculateDurationInMediaTime(std::int64_t instant, Vellum::FrameRate outputRate, double speed) {
-    const double duration = static_cast<double>(outputRate.GetTicksPerFrame()) * std::fabs(speed);
-    return {instant, instant + static_cast<std::int64_t>(duration + 0.5)};
+    return {instant, instant + Scale(outputRate.GetTicksPerFrame(), std::fabs(speed))};
 }
 
 bool IsDegenerate(const TimeSpan& span, Vellum::FrameRate fieldRate) {
@@ -33,9 +47,12 @@ void GetWeightedSamplesForRange(const TimeSpan& span, Vellum::FrameRate fieldRat
                                 std::uint32_t fieldIndex, std::vector<TimeSample>& samples) {
     const std::int64_t step = fieldRate.GetTicksPerFrame();
     if (step <= 0) return;
-    for (std::int64_t time = Align(span.start, fieldRate); time < span.end; time += step) {
-        const std::int64_t covered = std::min(time + step, span.end) - std::max(time, span.start);
-        samples.push_back({time, Align(time, frameRate), fieldIndex, static_cast<double>(covered)});
+    const std::int64_t first = Align(span.start, fieldRate);
+    const std::int64_t fieldsEach = 1 + (span.end - first - 1) / step / kMostSamples;
+    for (std::int64_t time = first; time < span.end; time += fieldsEach * step) {
+        const std::int64_t covered = std::min(time + fieldsEach * step, span.end) - std::max(time, span.start);
+        const std::int64_t shown = time + fieldsEach / 2 * step;
+        samples.push_back({shown, Align(shown, frameRate), fieldIndex, static_cast<double>(covered)});
     }
 }
 
@@ -64,6 +81,32 @@ double CalculateSampleWeight(std::int64_t time, std::int64_t before, std::int64_
     const double share = static_cast<double>(after - time) / static_cast<double>(after - before);
     if (share < kLeastShare) return 0.0;
     return share > 1.0 - kLeastShare ? 1.0 : share;
+}
+
+std::vector<TimeSample> SampleMoment(std::int64_t instant, const StreamTiming& stream, const SampledOutput& output) {
+    constexpr std::uint32_t kWholePicture = 0;
+    if (stream.backwards) {
+        const std::int64_t rest = output.frameRate.GetTicksPerFrame() - output.pictureRate.GetTicksPerFrame();
+        instant += Scale(rest, stream.speed);
+    }
+    std::vector<TimeSample> samples;
+    const TimeSpan span = CalculateDurationInMediaTime(instant, output.pictureRate, stream.speed);
+    if (output.blend && !IsDegenerate(span, stream.fieldRate)) {
+        GetWeightedSamplesForRange(span, stream.fieldRate, stream.frameRate, kWholePicture, samples);
+        NormalizeSampleWeights(samples);
+    } else {
+        std::int64_t before = 0;
+        std::int64_t after = 0;
+        GetSamplesAroundTime(instant, stream.fieldRate, output.blend, before, after);
+        const double share = CalculateSampleWeight(instant, before, after);
+        const auto add = [&](std::int64_t time, double weight) {
+            if (weight > 0.0) samples.push_back({time, Align(time, stream.frameRate), kWholePicture, weight});
+        };
+        add(before, share);
+        add(after, 1.0 - share);
+    }
+    if (stream.backwards && stream.fieldRate != stream.frameRate) ExchangeFields(samples, stream.fieldRate);
+    return samples;
 }
 
 }  // namespace Marl

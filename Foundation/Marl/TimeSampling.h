@@ -29,13 +29,18 @@ struct TimeSample {
     double weight = 1.0;           ///< 0.0 to 1.0
 };
 
-/// The media time that is shown from a media instant on, for an output rate and a speed (1.0: one second a second).
+/// The media time that is shown from a media instant on, for an output rate and a speed (1.0: one second a second). At
+/// most Vellum::kTime_Max long.
 [[nodiscard]] TimeSpan CalculateDurationInMediaTime(std::int64_t instant, Vellum::FrameRate outputRate, double speed);
 
 /// A span that covers no more than one field of the stream: it says nothing about shares, and its instant alone counts.
 [[nodiscard]] bool IsDegenerate(const TimeSpan& span, Vellum::FrameRate fieldRate);
 
-/// Appends the stream's fields that a span touches, each weighted by the ticks of it that lie within the span.
+/// More fields than this in one picture can't be told apart any more.
+constexpr std::int64_t kMostSamples = 64;
+
+/// Appends the stream's fields that a span touches, each weighted by the ticks of it that lie within the span. Of a
+/// span of more than kMostSamples fields it takes about that many, evenly spread, each for the stretch around it.
 void GetWeightedSamplesForRange(const TimeSpan& span, Vellum::FrameRate fieldRate, Vellum::FrameRate frameRate,
                                 std::uint32_t fieldIndex, std::vector<TimeSample>& samples);
 
@@ -50,5 +55,32 @@ void GetSamplesAroundTime(std::int64_t time, Vellum::FrameRate fieldRate, bool b
 /// The share of `before` in the picture at a time between the two: 1.0 on `before`, falling to 0.0 on `after`; 1.0 when
 /// they are one. A share within a millionth of 0.0 or 1.0 counts as that.
 [[nodiscard]] double CalculateSampleWeight(std::int64_t time, std::int64_t before, std::int64_t after);
+
+/// How the time of a stream runs under a clip.
+struct StreamTiming {
+    Vellum::FrameRate frameRate;
+    Vellum::FrameRate fieldRate;  ///< of the separate fields that can be had; the frame rate if none can
+    double speed = 1.0;           ///< 1.0: one second a second; never below 0
+    bool backwards = false;
+};
+
+/// What is made of a stream.
+struct SampledOutput {
+    Vellum::FrameRate frameRate;
+    Vellum::FrameRate pictureRate;  ///< of fields, where each is a picture of its own; else the frame rate
+    bool blend = false;
+};
+
+/// The fields that show what happens from a media instant on for as long as a picture of the output lasts: the nearest
+/// one, or with blending all that the picture covers, or the two around its moment when it covers no more than one.
+///
+/// A clip that plays backwards maps the beginning of an output *frame* to the beginning of the media stretch that the
+/// frame shows in reverse. A field shows half of that stretch, the later half first. And since what is the second field
+/// of a frame comes first then, the samples of separate fields name a frame's fields in the order in which they are
+/// shown: the later one has the frame's own time, the earlier one lies half a frame after it.
+///
+/// @param instant  what the clip maps the beginning of the picture to
+[[nodiscard]] std::vector<TimeSample> SampleMoment(std::int64_t instant, const StreamTiming& stream,
+                                                   const SampledOutput& output);
 
 }  // namespace Marl

@@ -4,15 +4,13 @@
 
 #include <cstdint>
 
-#include "Vellum/Field.h"
+#include "Vellum/FieldOrder.h"
 #include "Vellum/Time.h"
 
 /// Small questions about fields and the frames that times lie in.
 namespace Vantrel {
 
-[[nodiscard]] constexpr bool IsInterlaced(std::uint32_t fieldType) {
-    return fieldType == Vellum::kFieldType_UpperFirst || fieldType == Vellum::kFieldType_LowerFirst;
-}
+using Vellum::IsInterlaced;
 
 /// The start of the frame that a time lies in; the time itself for a rate of zero.
 [[nodiscard]] constexpr std::int64_t AlignToFrame(std::int64_t time, std::int64_t frameTicks) {

@@ -36,6 +36,36 @@ void Deinterlace(Picture& picture, int keep) {
     }
 }
 
+void ReverseFields(Picture& picture) {
+    for (int y = 0; y + 1 < picture.height; y += 2) {
+        std::swap_ranges(picture.At(0, y), picture.At(0, y) + std::size_t{4} * picture.width, picture.At(0, y + 1));
+    }
+}
+
+void WeaveField(Picture& picture, const Picture& other, bool oddLines) {
+    for (int y = oddLines ? 1 : 0; y < picture.height; y += 2) {
+        std::copy_n(other.At(0, y), std::size_t{4} * picture.width, picture.At(0, y));
+    }
+}
+
+Picture SoftenLines(const Picture& picture) {
+    Picture soft(picture.width, picture.height);
+    for (int y = 0; y < picture.height; ++y) {
+        for (int x = 0; x < picture.width; ++x) {
+            Pixel sum{};
+            for (int tap = -1; tap <= 1; ++tap) {
+                const Pixel p = picture.Get(x, std::clamp(y + tap, 0, picture.height - 1));
+                const double covered = p[3] * (tap == 0 ? 0.5 : 0.25);
+                for (std::size_t c = 0; c < 3; ++c) sum[c] += p[c] * covered;
+                sum[3] += covered;
+            }
+            for (std::size_t c = 0; c < 3; ++c) sum[c] = sum[3] > 0.0 ? sum[c] / sum[3] : 0.0;
+            soft.Set(x, y, sum);
+        }
+    }
+    return soft;
+}
+
 void Fill(Picture& picture, int left, int top, int width, int height, const Pixel& color) {
     for (int y = std::max(top, 0); y < std::min(top + height, picture.height); ++y) {
         for (int x = std::max(left, 0); x < std::min(left + width, picture.width); ++x) picture.Set(x, y, color);

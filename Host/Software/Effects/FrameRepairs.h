@@ -18,6 +18,16 @@ void Unpremultiply(Picture& picture, std::uint32_t matteColor);
 /// is.
 void Deinterlace(Picture& picture, int keep);
 
+/// Exchanges the lines of the two fields: 0 with 1, 2 with 3, ... The last line of an odd number stays.
+void ReverseFields(Picture& picture);
+
+/// Puts the lines of one field of another picture of the same size into a picture: the odd ones, or the even ones.
+void WeaveField(Picture& picture, const Picture& other, bool oddLines);
+
+/// Softens across the lines: each becomes a quarter of the line above, half of itself and a quarter of the line below,
+/// colour weighed by alpha; beyond the border lies the border's line.
+[[nodiscard]] Picture SoftenLines(const Picture& picture);
+
 /// Fills a rectangle, as far as it lies inside.
 void Fill(Picture& picture, int left, int top, int width, int height, const Pixel& color);
 

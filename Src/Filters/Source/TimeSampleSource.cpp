@@ -37,6 +37,7 @@ Status TimeSampleSource::Configure(const VideoNodeRef& description, const Render
     const auto media = boost::dynamic_pointer_cast<VideoMediaNode>(description);
     if (!media) return Ostrand::kStatus_Failure;
     mSpeed = media->GetClipSpeed();
+    mBackwards = media->GetClipBackwards();
     mFrameBlend = media->GetStreamFrameBlend();
     mContentStart = media->GetContentStart();
     return FilterNode::Configure(description, requirements, host);
@@ -46,28 +47,8 @@ std::int64_t TimeSampleSource::GetMediaTime(std::int64_t instant) const {
     return GetNodeTime(instant, false) + mContentStart;
 }
 
-std::vector<Marl::TimeSample> TimeSampleSource::SampleInstant(std::int64_t instant, Vellum::FrameRate outputRate,
-                                                              bool blend) {
-    const Vellum::FrameRate fieldRate = GetFieldRate();
-    const Vellum::FrameRate frameRate = GetFrameRate();
-    std::vector<Marl::TimeSample> samples;
-    const Marl::TimeSpan span = Marl::CalculateDurationInMediaTime(instant, outputRate, mSpeed);
-    if (blend && !Marl::IsDegenerate(span, fieldRate)) {
-        Marl::GetWeightedSamplesForRange(span, fieldRate, frameRate, kWholePicture, samples);
-        Marl::NormalizeSampleWeights(samples);
-        return samples;
-    }
-    std::int64_t before = 0;
-    std::int64_t after = 0;
-    Marl::GetSamplesAroundTime(instant, fieldRate, blend, before, after);
-    const double share = Marl::CalculateSampleWeight(instant, before, after);
-    const auto add = [&](std::int64_t time, double weight) {
-        const std::int64_t frameTime = AlignToFrame(time, frameRate.GetTicksPerFrame());
-        if (weight > 0.0) samples.push_back({time, frameTime, kWholePicture, weight});
-    };
-    add(before, share);
-    add(after, 1.0 - share);
-    return samples;
+std::vector<Marl::TimeSample> TimeSampleSource::SampleInstant(std::int64_t instant, const Marl::SampledOutput& output) {
+    return Marl::SampleMoment(GetMediaTime(instant), {GetFrameRate(), GetFieldRate(), mSpeed, mBackwards}, output);
 }
 
 void TimeSampleSource::GetInputTimes(const RenderParams& params, SampleSet& times, bool) {
@@ -79,13 +60,13 @@ void TimeSampleSource::GetInputTimes(const RenderParams& params, SampleSet& time
 
     times.clear();
     if (!IsInterlaced(fieldType)) {
-        Add(times, SampleInstant(GetMediaTime(start), rate, blend), kWholePicture);
+        Add(times, SampleInstant(start, {rate, rate, blend}), kWholePicture);
         return;
     }
     const Vellum::FrameRate outputFieldRate = rate.Faster(2);
     const auto sampleField = [&](bool later) {
         const std::int64_t instant = start + (later ? outputFieldRate.GetTicksPerFrame() : 0);
-        return SampleInstant(GetMediaTime(instant), outputFieldRate, blend);
+        return SampleInstant(instant, {rate, outputFieldRate, blend});
     };
     if (params.fieldSelection != Vellum::kFieldSelection_Frame) {
         Add(times, sampleField(second), kWholePicture);

@@ -38,13 +38,13 @@ private:
 
     /// The media time that a moment of the output shows.
     [[nodiscard]] std::int64_t GetMediaTime(std::int64_t instant) const;
-    [[nodiscard]] std::vector<Marl::TimeSample> SampleInstant(std::int64_t instant, Vellum::FrameRate outputRate,
-                                                              bool blend);
+    [[nodiscard]] std::vector<Marl::TimeSample> SampleInstant(std::int64_t instant, const Marl::SampledOutput& output);
     Status Sum(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                const WeightedFrames& upper, const WeightedFrames& others, VideoFrameRef& frame);
     Status Accumulate(const WeightedFrames& samples, const VideoFrameRef& target, std::int32_t mode) const;
 
     double mSpeed = 1.0;
+    bool mBackwards = false;
     bool mFrameBlend = false;
     std::int64_t mContentStart = 0;
 };
