@@ -95,6 +95,14 @@ std::shared_ptr<HostPicture> MakeHostPicture(PixelBufferPool& pool, Vellum::Pixe
     return picture;
 }
 
+std::shared_ptr<HostPicture> ShareField(const HostPicture& picture, int field) {
+    auto shared = std::make_shared<HostPicture>(picture);
+    shared->pixels = std::shared_ptr<std::byte>(picture.pixels, picture.GetRow(field));
+    shared->rowBytes = 2 * picture.rowBytes;
+    shared->height = (picture.height + 1 - field) / 2;
+    return shared;
+}
+
 Glaze* MakeGlaze(const HostPictureRef& picture) {
     auto storage = std::make_unique<SharedPicture>(picture);
     auto glaze = std::make_unique<Glaze>();

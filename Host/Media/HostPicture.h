@@ -59,6 +59,9 @@ struct HostPicture {
 };
 using HostPictureRef = std::shared_ptr<const HostPicture>;
 
+/// The lines of one field as a picture of half the height that shares the pixels: 0 has the even lines, 1 the odd ones.
+[[nodiscard]] std::shared_ptr<HostPicture> ShareField(const HostPicture& picture, int field);
+
 /// A picture with undefined pixels. Throws std::bad_alloc.
 [[nodiscard]] std::shared_ptr<HostPicture> MakeHostPicture(PixelBufferPool& pool, Vellum::PixelFormat format,
                                                            std::int32_t width, std::int32_t height);

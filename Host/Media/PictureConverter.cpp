@@ -89,6 +89,25 @@ std::shared_ptr<HostPicture> Rotate(const HostPicture& source, int rotation, Pix
     return target;
 }
 
+/// Interlaced, with chroma that is stored for pairs of lines.
+bool HasSeparateFields(const AVFrame& frame) {
+    const AVPixFmtDescriptor* format = av_pix_fmt_desc_get(static_cast<AVPixelFormat>(frame.format));
+    return frame.interlaced_frame != 0 && frame.height % 4 == 0 && format->log2_chroma_h == 1;
+}
+
+/// The lines of one field as a frame that shares the memory.
+Frame ShareFieldOf(const AVFrame& frame, int field) {
+    Frame shared = ShareFrame(frame);
+    for (int plane = 0; plane < AV_NUM_DATA_POINTERS && shared->data[plane]; ++plane) {
+        shared->data[plane] += static_cast<std::ptrdiff_t>(shared->linesize[plane]) * field;
+        shared->linesize[plane] *= 2;
+    }
+    // By the height of the whole picture, which a field no longer tells.
+    if (MatrixOf(frame) == SWS_CS_ITU709) shared->colorspace = AVCOL_SPC_BT709;
+    shared->height /= 2;
+    return shared;
+}
+
 struct FloatPixel {
     float channels[4];
 };
@@ -126,14 +145,8 @@ void PictureConverter::Prepare(const AVFrame& frame, AVPixelFormat target) {
     mPlanar.reset();
 }
 
-void PictureConverter::ConvertBytes(const AVFrame& frame, const HostPicture& picture) {
-    Prepare(frame, AV_PIX_FMT_BGRA);
-    std::uint8_t* const planes[] = {reinterpret_cast<std::uint8_t*>(picture.pixels.get())};
-    const int strides[] = {picture.rowBytes};
-    sws_scale(mScaler.get(), frame.data, frame.linesize, 0, frame.height, planes, strides);
-}
-
-std::shared_ptr<HostPicture> PictureConverter::ConvertDeep(const AVFrame& frame) {
+void PictureConverter::ConvertDeep(const AVFrame& frame, HostPicture& picture) {
+    if (ConvertDeepPicture(frame, WeightsOf(frame), IsFullRange(frame), picture)) return;
     Prepare(frame, AV_PIX_FMT_GBRAPF32);
     if (!mPlanar) {
         mPlanar = MakeFrame();
@@ -143,7 +156,6 @@ std::shared_ptr<HostPicture> PictureConverter::ConvertDeep(const AVFrame& frame)
         if (av_frame_get_buffer(mPlanar.get(), 64) < 0) throw std::bad_alloc();
     }
     sws_scale(mScaler.get(), frame.data, frame.linesize, 0, frame.height, mPlanar->data, mPlanar->linesize);
-    auto picture = MakeHostPicture(*mPool, Vellum::kPixelFormat_BGRA_4444_32f, frame.width, frame.height);
     for (std::int32_t y = 0; y < frame.height; ++y) {
         // Planes lie in the order green, blue, red, alpha.
         const float* planes[4];
@@ -151,7 +163,7 @@ std::shared_ptr<HostPicture> PictureConverter::ConvertDeep(const AVFrame& frame)
             planes[plane] = reinterpret_cast<const float*>(mPlanar->data[plane] +
                                                            static_cast<std::ptrdiff_t>(mPlanar->linesize[plane]) * y);
         }
-        auto* row = reinterpret_cast<float*>(picture->GetRow(y));
+        auto* row = reinterpret_cast<float*>(picture.GetRow(y));
         for (std::int32_t x = 0; x < frame.width; ++x) {
             row[4 * x] = planes[1][x];
             row[4 * x + 1] = planes[0][x];
@@ -159,17 +171,28 @@ std::shared_ptr<HostPicture> PictureConverter::ConvertDeep(const AVFrame& frame)
             row[4 * x + 3] = planes[3][x];
         }
     }
-    return picture;
+}
+
+void PictureConverter::ConvertLines(const AVFrame& frame, HostPicture& picture) {
+    if (IsDeepFormat(frame.format)) return ConvertDeep(frame, picture);
+    if (ConvertPlanarBytes(frame, WeightsOf(frame), IsFullRange(frame), picture)) return;
+    Prepare(frame, AV_PIX_FMT_BGRA);
+    std::uint8_t* const planes[] = {reinterpret_cast<std::uint8_t*>(picture.pixels.get())};
+    const int strides[] = {picture.rowBytes};
+    sws_scale(mScaler.get(), frame.data, frame.linesize, 0, frame.height, planes, strides);
 }
 
 std::shared_ptr<HostPicture> PictureConverter::Convert(const AVFrame& frame, int rotation) {
-    std::shared_ptr<HostPicture> picture;
-    if (IsDeepFormat(frame.format)) {
-        picture = MakeHostPicture(*mPool, Vellum::kPixelFormat_BGRA_4444_32f, frame.width, frame.height);
-        if (!ConvertDeepPicture(frame, WeightsOf(frame), IsFullRange(frame), *picture)) picture = ConvertDeep(frame);
+    auto picture = MakeHostPicture(
+        *mPool, IsDeepFormat(frame.format) ? Vellum::kPixelFormat_BGRA_4444_32f : Vellum::kPixelFormat_BGRA_4444_8u,
+        frame.width, frame.height);
+    if (HasSeparateFields(frame)) {
+        // A line of chroma belongs to two lines of one field, which lie between those of the other.
+        for (int field = 0; field < 2; ++field) {
+            ConvertLines(*ShareFieldOf(frame, field), *ShareField(*picture, field));
+        }
     } else {
-        picture = MakeHostPicture(*mPool, Vellum::kPixelFormat_BGRA_4444_8u, frame.width, frame.height);
-        if (!ConvertPlanarBytes(frame, WeightsOf(frame), IsFullRange(frame), *picture)) ConvertBytes(frame, *picture);
+        ConvertLines(frame, *picture);
     }
     const AVPixFmtDescriptor* format = av_pix_fmt_desc_get(static_cast<AVPixelFormat>(frame.format));
     picture->alphaType =

@@ -21,8 +21,9 @@ public:
 
 private:
     void Prepare(const AVFrame& frame, AVPixelFormat target);
-    void ConvertBytes(const AVFrame& frame, const HostPicture& picture);
-    [[nodiscard]] std::shared_ptr<HostPicture> ConvertDeep(const AVFrame& frame);
+    void ConvertDeep(const AVFrame& frame, HostPicture& picture);
+    /// All lines of a frame, or those of one field.
+    void ConvertLines(const AVFrame& frame, HostPicture& picture);
 
     std::shared_ptr<PixelBufferPool> mPool;
     ScaleContext mScaler;

@@ -9,6 +9,8 @@
 #include <cstring>
 #include <filesystem>
 
+#include "Vellum/FieldOrder.h"
+
 extern "C" {
 #include <libavutil/pixdesc.h>
 }
@@ -21,11 +23,17 @@ void Demand(int code, const std::string& path, const char* what) {
     if (code < 0) throw OutputError(path + ": " + what + ": " + DescribeFFmpegError(code));
 }
 
-/// Subsampled chroma needs even sizes: the last column and row stand twice in the picture that is encoded.
-std::shared_ptr<HostPicture> PadToEven(const HostPicture& picture, PixelBufferPool& pool) {
-    auto padded = MakeHostPicture(pool, picture.format, (picture.width + 1) & ~1, (picture.height + 1) & ~1);
+std::int32_t RoundUp(std::int32_t size, std::int32_t step) { return (size + step - 1) / step * step; }
+
+/// Subsampled chroma needs even sizes, of each field where there are two: the last column and the last line of each
+/// field are repeated.
+std::shared_ptr<HostPicture> PadTo(const HostPicture& picture, std::int32_t width, std::int32_t height, bool interlaced,
+                                   PixelBufferPool& pool) {
+    auto padded = MakeHostPicture(pool, picture.format, width, height);
+    const std::int32_t step = interlaced && picture.height > 1 ? 2 : 1;
     for (std::int32_t y = 0; y < padded->height; ++y) {
-        const std::byte* from = picture.GetRow(std::min(y, picture.height - 1));
+        const std::int32_t beyond = std::max(0, y - picture.height + 1);
+        const std::byte* from = picture.GetRow(y - RoundUp(beyond, step));
         std::byte* to = padded->GetRow(y);
         const auto bytes = static_cast<std::size_t>(picture.width) * 4;
         std::memcpy(to, from, bytes);
@@ -72,7 +80,8 @@ Encoder::Encoder(const char* encoderName, const OutputFormat& format, AVPixelFor
     if (!mContext) throw std::bad_alloc();
     const bool even = IsSubsampled(pixelFormat);
     mContext->width = even ? (format.width + 1) & ~1 : format.width;
-    mContext->height = even ? (format.height + 1) & ~1 : format.height;
+    mInterlaced = even && Vellum::IsInterlaced(format.fieldType);
+    mContext->height = even ? RoundUp(format.height, mInterlaced ? 4 : 2) : format.height;
     mContext->pix_fmt = pixelFormat;
     mContext->sample_aspect_ratio = {format.aspect.numerator, format.aspect.denominator};
     AVDictionary* options = nullptr;
@@ -89,8 +98,9 @@ Encoder::Encoder(const char* encoderName, const OutputFormat& format, AVPixelFor
     Demand(av_frame_get_buffer(mFrame.get(), 64), format.path, "no memory for a picture");
     const AVPixFmtDescriptor* descriptor = av_pix_fmt_desc_get(pixelFormat);
     if ((descriptor->flags & AV_PIX_FMT_FLAG_FLOAT) != 0) return;
-    mScaler.reset(sws_getContext(mContext->width, mContext->height, AV_PIX_FMT_BGRA, mContext->width, mContext->height,
-                                 pixelFormat, SWS_BILINEAR | SWS_ACCURATE_RND, nullptr, nullptr, nullptr));
+    const int lines = mInterlaced ? mContext->height / 2 : mContext->height;
+    mScaler.reset(sws_getContext(mContext->width, lines, AV_PIX_FMT_BGRA, mContext->width, lines, pixelFormat,
+                                 SWS_BILINEAR | SWS_ACCURATE_RND, nullptr, nullptr, nullptr));
     if (!mScaler) throw OutputError(format.path + ": pictures can't be converted for " + encoderName);
     sws_setColorspaceDetails(mScaler.get(), sws_getCoefficients(SWS_CS_DEFAULT), 1, sws_getCoefficients(SWS_CS_ITU709),
                              mContext->color_range == AVCOL_RANGE_JPEG ? 1 : 0, 0, 1 << 16, 1 << 16);
@@ -100,12 +110,30 @@ void Encoder::ConvertPacked(const HostPicture& picture) {
     std::shared_ptr<HostPicture> padded;
     const HostPicture* source = &picture;
     if (picture.width != mContext->width || picture.height != mContext->height) {
-        padded = PadToEven(picture, *mPool);
+        padded = PadTo(picture, mContext->width, mContext->height, mInterlaced, *mPool);
         source = padded.get();
+    }
+    if (mInterlaced) {
+        // Chroma is shared between lines of one field only.
+        for (int field = 0; field < 2; ++field) ConvertField(*source, field);
+        return;
     }
     const std::uint8_t* const planes[] = {reinterpret_cast<const std::uint8_t*>(source->pixels.get())};
     const int strides[] = {source->rowBytes};
     sws_scale(mScaler.get(), planes, strides, 0, source->height, mFrame->data, mFrame->linesize);
+}
+
+void Encoder::ConvertField(const HostPicture& picture, int field) {
+    const std::shared_ptr<HostPicture> source = ShareField(picture, field);
+    const std::uint8_t* const planes[] = {reinterpret_cast<const std::uint8_t*>(source->pixels.get())};
+    const int strides[] = {source->rowBytes};
+    std::uint8_t* targets[4] = {};
+    int targetStrides[4] = {};
+    for (int plane = 0; plane < 4 && mFrame->data[plane]; ++plane) {
+        targets[plane] = mFrame->data[plane] + static_cast<std::ptrdiff_t>(mFrame->linesize[plane]) * field;
+        targetStrides[plane] = 2 * mFrame->linesize[plane];
+    }
+    sws_scale(mScaler.get(), planes, strides, 0, source->height, targets, targetStrides);
 }
 
 void Encoder::ConvertFloat(const HostPicture& picture) {
@@ -134,6 +162,8 @@ void Encoder::Encode(const HostPicture* picture, std::int64_t pts, const std::fu
             ConvertFloat(*picture);
         }
         mFrame->pts = pts;
+        mFrame->interlaced_frame = mInterlaced ? 1 : 0;
+        mFrame->top_field_first = mFormat.fieldType == Vellum::kFieldType_UpperFirst ? 1 : 0;
     }
     Demand(avcodec_send_frame(mContext.get(), picture ? mFrame.get() : nullptr), mFormat.path,
            "a picture can't be encoded");

@@ -43,11 +43,13 @@ public:
 
 private:
     void ConvertPacked(const HostPicture& picture);
+    void ConvertField(const HostPicture& picture, int field);
     void ConvertFloat(const HostPicture& picture);
 
     OutputFormat mFormat;
     CodecContext mContext;
     ScaleContext mScaler;
+    bool mInterlaced = false;
     Frame mFrame = MakeFrame();
     Packet mPacket = MakePacket();
     std::shared_ptr<PixelBufferPool> mPool = PixelBufferPool::Create();

@@ -4,6 +4,8 @@
 
 #include <cerrno>
 
+#include "Vellum/FieldOrder.h"
+
 namespace Vantrel::Host {
 
 namespace {
@@ -36,10 +38,11 @@ FilmWriter::FilmWriter(const OutputFormat& format) : mFile(format.path) {
             context.color_primaries = AVCOL_PRI_BT709;
             context.color_trc = AVCOL_TRC_BT709;
             context.color_range = AVCOL_RANGE_MPEG;
-            if (format.fieldType == Vellum::kFieldType_UpperFirst ||
-                format.fieldType == Vellum::kFieldType_LowerFirst) {
+            if (Vellum::IsInterlaced(format.fieldType)) {
+                const bool upperFirst = format.fieldType == Vellum::kFieldType_UpperFirst;
                 context.flags |= AV_CODEC_FLAG_INTERLACED_DCT | AV_CODEC_FLAG_INTERLACED_ME;
-                context.field_order = format.fieldType == Vellum::kFieldType_UpperFirst ? AV_FIELD_TT : AV_FIELD_BB;
+                context.field_order = upperFirst ? AV_FIELD_TT : AV_FIELD_BB;
+                av_dict_set(options, "x264-params", upperFirst ? "tff=1" : "bff=1", 0);
             }
             if ((output->oformat->flags & AVFMT_GLOBALHEADER) != 0) context.flags |= AV_CODEC_FLAG_GLOBAL_HEADER;
             av_dict_set(options, "preset", "veryfast", 0);

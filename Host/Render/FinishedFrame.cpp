@@ -26,6 +26,7 @@ HostPictureRef ShareHostFrame(const Marl::VideoFrameRef& frame) {
     picture->rowBytes = Ostrand::Demand<Marl::IFrameRows>(frame)->GetRowBytes();
     picture->aspect = frame->GetPixelAspectRatio();
     picture->fieldType = frame->GetFieldType();
+    picture->origin = frame->GetOrigin();
     picture->alphaType = frame->GetAlphaType();
     auto* pixels = reinterpret_cast<std::byte*>(Ostrand::Demand<Marl::IFrameData>(frame)->GetData());
     picture->pixels = std::shared_ptr<std::byte>(pixels, [frame](std::byte*) {});
@@ -65,6 +66,7 @@ std::shared_ptr<HostPicture> CopyConverted(PixelBufferPool& pool, const HostPict
     auto target = MakeHostPicture(pool, format, source.width, source.height);
     target->aspect = source.aspect;
     target->fieldType = source.fieldType;
+    target->origin = source.origin;
     for (std::int32_t y = 0; y < source.height; ++y) {
         if (fromBytes == toBytes) {
             std::memcpy(target->GetRow(y), source.GetRow(y),
@@ -99,6 +101,7 @@ std::shared_ptr<HostPicture> TakeFinishedFrame(PixelBufferPool& pool, const Marl
     auto picture = MakeHostPicture(pool, format, bounds.Width(), bounds.Height());
     picture->aspect = frame->GetPixelAspectRatio();
     picture->fieldType = frame->GetFieldType();
+    picture->origin = frame->GetOrigin();
     if (Ostrand::Failed(Kiln::CopyFromDevice(WrapPicture(picture), frame))) return nullptr;
     return picture;
 }
@@ -108,6 +111,25 @@ std::shared_ptr<HostPicture> MakeTransparentPicture(PixelBufferPool& pool, Vellu
     auto picture = MakeHostPicture(pool, format, width, height);
     std::memset(picture->pixels.get(), 0, picture->GetBytes());
     return picture;
+}
+
+std::shared_ptr<HostPicture> PlaceOnOutput(PixelBufferPool& pool, std::shared_ptr<HostPicture> picture,
+                                           std::int32_t width, std::int32_t height) {
+    if (picture->width == width && picture->height == height) return picture;
+    auto placed = MakeTransparentPicture(pool, picture->format, width, height);
+    placed->aspect = picture->aspect;
+    placed->fieldType = picture->fieldType;
+    const Vellum::Point origin = picture->origin;
+    const std::int32_t left = std::max(0, -origin.x);
+    const std::int32_t right = std::min(width, picture->width - origin.x);
+    const std::size_t pixel = Vellum::BytesPerPixel(picture->format);
+    for (std::int32_t y = std::max(0, -origin.y); y < std::min(height, picture->height - origin.y) && left < right;
+         ++y) {
+        std::memcpy(placed->GetRow(y) + pixel * static_cast<std::size_t>(left),
+                    picture->GetRow(y + origin.y) + pixel * static_cast<std::size_t>(left + origin.x),
+                    pixel * static_cast<std::size_t>(right - left));
+    }
+    return placed;
 }
 
 void WeaveFields(HostPicture& upper, const HostPicture& lower) {

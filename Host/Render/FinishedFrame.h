@@ -17,6 +17,11 @@ namespace Vantrel::Host {
 /// Lays a picture over opaque black, in place.
 void LayOverBlack(HostPicture& picture);
 
+/// A picture of another size than the output's, which only a tree without a compositor gives, cut or padded with
+/// transparent black to the output's; its origin says where that lies in it.
+[[nodiscard]] std::shared_ptr<HostPicture> PlaceOnOutput(PixelBufferPool& pool, std::shared_ptr<HostPicture> picture,
+                                                         std::int32_t width, std::int32_t height);
+
 /// Puts the lower field's lines (1, 3, ...) of `lower` into `upper`. Both have the same size and format.
 void WeaveFields(HostPicture& upper, const HostPicture& lower);
 

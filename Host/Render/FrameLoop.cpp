@@ -152,12 +152,17 @@ std::shared_ptr<HostPicture> FrameLoop::RenderOnDevice(const RenderJob& job, Req
     }
     if (Ostrand::Failed(status)) return nullptr;
     if (!first) return MakeTransparentPicture(*mPool, job.format, job.width, job.height);
-    std::shared_ptr<HostPicture> picture = TakeFinishedFrame(*mPool, first, job.format);
+    const auto take = [&](const VideoFrameRef& frame) {
+        std::shared_ptr<HostPicture> taken = TakeFinishedFrame(*mPool, frame, job.format);
+        return taken ? PlaceOnOutput(*mPool, std::move(taken), job.width, job.height) : nullptr;
+    };
+    std::shared_ptr<HostPicture> picture = take(first);
     if (!picture || !second) return picture;
-    const std::shared_ptr<HostPicture> other = TakeFinishedFrame(*mPool, second, job.format);
+    const std::shared_ptr<HostPicture> other = take(second);
     if (!other) return nullptr;
     // Whatever their order in time, the engine hands the upper field's frame out first.
     WeaveFields(*picture, *other);
+    picture->fieldType = mFieldType;
     return picture;
 }
 

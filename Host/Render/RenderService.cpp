@@ -85,7 +85,8 @@ struct RenderService::Entries {
             if (!node || !description || !callback) return kRefused;
             const SequenceSize sequence{width, height, {aspectNumerator, aspectDenominator}, frameTicks};
             auto render = [&service, node, nodeTime, sequence, kept = KeptDescription(*description)](auto& text) {
-                text = SubtreeText(NodeFingerprint(*node, nodeTime, kept.Get()));
+                text = SubtreeText(
+                    NodeFingerprint(*node, nodeTime, kept.Get(), Vellum::HalfFrameTicks(sequence.frameTicks)));
                 return service.mRenderer.RenderNode(*node, nodeTime, sequence, kept.Get());
             };
             *requestID = service.Submit(time, std::move(render), callback, context, service.mRenderedSubtrees);
@@ -94,12 +95,13 @@ struct RenderService::Entries {
     }
 
     static VantrelHostStatus GetNodeFrameHash(std::uint32_t, std::uint32_t nodeID, std::int64_t, std::int64_t nodeTime,
-                                              std::int64_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t,
-                                              const VantrelRenderDescription* description, char* hashText) {
+                                              std::int64_t frameTicks, std::int32_t, std::int32_t, std::int32_t,
+                                              std::int32_t, const VantrelRenderDescription* description,
+                                              char* hashText) {
         return With([&](RenderService& service) {
             const NodePtr node = service.mServices.FindNode(nodeID);
             if (!node || !description) return kRefused;
-            WriteHash(NodeFingerprint(*node, nodeTime, *description), hashText);
+            WriteHash(NodeFingerprint(*node, nodeTime, *description, Vellum::HalfFrameTicks(frameTicks)), hashText);
             return 0;
         });
     }
@@ -116,7 +118,8 @@ struct RenderService::Entries {
             const SequenceSize sequence{width, height, {aspectNumerator, aspectDenominator}, frameTicks};
             auto render = [&service, clip, endOperator, rawTime, sequence,
                            kept = KeptDescription(*description)](auto& text) {
-                text = SubtreeText(OperatorsFingerprint(*clip, endOperator, rawTime, kept.Get()));
+                text = SubtreeText(OperatorsFingerprint(*clip, endOperator, rawTime, kept.Get(),
+                                                        Vellum::HalfFrameTicks(sequence.frameTicks)));
                 return service.mRenderer.RenderOperators(*clip, endOperator, rawTime, sequence, kept.Get());
             };
             *requestID = service.Submit(time, std::move(render), callback, context, service.mRenderedSubtrees);
@@ -126,13 +129,15 @@ struct RenderService::Entries {
 
     static VantrelHostStatus GetOperatorsFrameHash(std::uint32_t, std::uint32_t clipNodeID, std::int32_t,
                                                    std::int32_t endOperator, std::int64_t, std::int64_t rawTime,
-                                                   std::int64_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t,
-                                                   std::uint32_t, const VantrelRenderDescription* description,
-                                                   char* hashText) {
+                                                   std::int64_t frameTicks, std::int32_t, std::int32_t, std::int32_t,
+                                                   std::int32_t, std::uint32_t,
+                                                   const VantrelRenderDescription* description, char* hashText) {
         return With([&](RenderService& service) {
             const NodePtr clip = service.mServices.FindNode(clipNodeID);
             if (!clip || !description) return kRefused;
-            WriteHash(OperatorsFingerprint(*clip, endOperator, rawTime, *description), hashText);
+            WriteHash(
+                OperatorsFingerprint(*clip, endOperator, rawTime, *description, Vellum::HalfFrameTicks(frameTicks)),
+                hashText);
             return 0;
         });
     }

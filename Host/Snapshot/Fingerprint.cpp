@@ -6,9 +6,21 @@
 
 #include "Host/Snapshot/ContentHasher.h"
 #include "Host/Time/ExactTime.h"
+#include "Vellum/FieldOrder.h"
 
 namespace Vantrel::Host {
 namespace {
+
+/// The frame, or in interlaced media the field, that lies at a media time.
+std::int64_t MediaFieldAt(const MediaInfo& info, std::int64_t mediaTime) {
+    const std::int64_t frame = MediaFrameAt(info, mediaTime);
+    if (info.still || info.fieldType == FieldType::kProgressive) return frame;
+    return 2 * frame + (FrameNumberAt(mediaTime, Vellum::HalfFrameTicks(info.ticksPerFrame)) & 1);
+}
+
+bool HoldsTwoMoments(const VantrelRenderDescription& description, std::int64_t fieldTicks) {
+    return fieldTicks > 0 && Vellum::IsInterlaced(description.fieldType);
+}
 
 /// Walks a tree at one instant and collects what the picture shows there.
 class Evaluation {
@@ -44,7 +56,8 @@ public:
         Operators(node, times, endOperator);
     }
 
-    void Description(const VantrelRenderDescription& description) {
+    void Description(const VantrelRenderDescription& description, std::int64_t fieldTicks) {
+        mHasher.Number(fieldTicks);
         mHasher.Number(description.width).Number(description.height);
         mHasher.Number(description.aspectNumerator).Number(description.aspectDenominator);
         mHasher.Number(description.quality).Number(description.fieldType).Number(description.compositeOnBlack);
@@ -99,12 +112,17 @@ private:
     void Media(const MediaDetail& media, std::int64_t time) {
         const MediaClip& clip = *media.clip;
         mHasher.Number(static_cast<std::int64_t>(media.scale)).Number(static_cast<std::int64_t>(media.alpha));
-        mHasher.Number(media.frameBlend).Number(media.deinterlace).Number(media.reverseFieldDominance);
+        mHasher.Number(media.frameBlend)
+            .Number(media.deinterlace)
+            .Number(media.reverseFieldDominance)
+            .Number(media.held);
         mHasher.Number(clip.info.width).Number(clip.info.height);
         const auto* nested = std::get_if<NestedSource>(&clip.source);
         if (nested != nullptr && clip.id == 0 && !media.samplesTime) return Nested(*nested->sequence, time);
         mHasher.Identifier(clip.identity);
-        mHasher.Number(media.samplesTime ? time : MediaFrameAt(clip.info, time));
+        // Of how much lies in a blended frame, and of the order of its fields.
+        if (media.samplesTime) mHasher.Real(media.speed).Number(media.backwards);
+        mHasher.Number(media.samplesTime ? time : MediaFieldAt(clip.info, time));
     }
 
     void Nested(const Sequence& sequence, std::int64_t time) {
@@ -129,30 +147,39 @@ ItemTimes TimesOfRawTime(const ItemDetail& item, std::int64_t rawTime) {
     return map.AtItemTime(rawTime);
 }
 
-Guid NodeFingerprint(const Node& node, std::int64_t nodeTime, const VantrelRenderDescription& description) {
+Guid NodeFingerprint(const Node& node, std::int64_t nodeTime, const VantrelRenderDescription& description,
+                     std::int64_t fieldTicks) {
     Evaluation evaluation;
-    if (node.kind == NodeKind::kClip) {
-        evaluation.Clip(node, node.AsItem()->time.FromTransformed(nodeTime), node.operators.size());
-    } else {
-        evaluation.Node(node, nodeTime);
-    }
-    evaluation.Description(description);
+    const auto add = [&](std::int64_t time) {
+        if (node.kind == NodeKind::kClip) {
+            evaluation.Clip(node, node.AsItem()->time.FromTransformed(time), node.operators.size());
+        } else {
+            evaluation.Node(node, time);
+        }
+    };
+    add(nodeTime);
+    if (HoldsTwoMoments(description, fieldTicks)) add(node.LaterTime(nodeTime, fieldTicks));
+    evaluation.Description(description, fieldTicks);
     return evaluation.Finish();
 }
 
 Guid OperatorsFingerprint(const Node& clip, std::int32_t endOperator, std::int64_t rawTime,
-                          const VantrelRenderDescription& description) {
+                          const VantrelRenderDescription& description, std::int64_t fieldTicks) {
     Evaluation evaluation;
     if (const ItemDetail* item = clip.AsItem()) {
-        evaluation.Clip(clip, TimesOfRawTime(*item, rawTime), static_cast<std::size_t>(std::max(endOperator, 0)));
+        const auto end = static_cast<std::size_t>(std::max(endOperator, 0));
+        evaluation.Clip(clip, TimesOfRawTime(*item, rawTime), end);
+        if (HoldsTwoMoments(description, fieldTicks)) {
+            evaluation.Clip(clip, TimesOfRawTime(*item, rawTime + fieldTicks), end);
+        }
     }
-    evaluation.Description(description);
+    evaluation.Description(description, fieldTicks);
     return evaluation.Finish();
 }
 
 Guid ClipFingerprint(const MediaClip& clip, std::int64_t mediaTime, const VantrelClipRecord& record) {
     ContentHasher hasher;
-    hasher.Identifier(clip.identity).Number(MediaFrameAt(clip.info, mediaTime));
+    hasher.Identifier(clip.identity).Number(MediaFieldAt(clip.info, mediaTime));
     hasher.Number(record.pixelFormat).Number(record.width).Number(record.height);
     hasher.Number(record.aspectNumerator).Number(record.aspectDenominator);
     hasher.Number(record.fieldType).Number(record.quality);

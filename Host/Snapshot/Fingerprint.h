@@ -11,17 +11,19 @@
 /// opened; the calls come for every node and frame.
 namespace Vantrel::Host {
 
-/// Of the picture of a node.
+/// Of the picture of a node. Where a description asks for an interlaced picture, the moment of its second field counts
+/// too.
 /// @param nodeTime media time for media; for a clip or nested sequence what TransformTime gave for its own time; for
 /// all
 ///                 other kinds the node's own time
-[[nodiscard]] Guid NodeFingerprint(const Node& node, std::int64_t nodeTime,
-                                   const VantrelRenderDescription& description);
+/// @param fieldTicks half a frame of the sequence; 0 to leave the second field out
+[[nodiscard]] Guid NodeFingerprint(const Node& node, std::int64_t nodeTime, const VantrelRenderDescription& description,
+                                   std::int64_t fieldTicks = 0);
 
 /// Of the picture of a clip after its operators before `endOperator`.
 /// @param rawTime the clip's own time, or its hold time where effects stand still with the picture
 [[nodiscard]] Guid OperatorsFingerprint(const Node& clip, std::int32_t endOperator, std::int64_t rawTime,
-                                        const VantrelRenderDescription& description);
+                                        const VantrelRenderDescription& description, std::int64_t fieldTicks = 0);
 
 /// Of one undecorated media frame.
 [[nodiscard]] Guid ClipFingerprint(const MediaClip& clip, std::int64_t mediaTime, const VantrelClipRecord& record);

@@ -4,6 +4,8 @@
 
 #include <algorithm>
 
+#include "Host/Time/ExactTime.h"
+
 namespace Vantrel::Host {
 
 const char* GetKindText(NodeKind kind) {
@@ -46,6 +48,16 @@ const Parameter* Node::FindParameter(std::int32_t index) const {
     const auto found = std::lower_bound(parameters->begin(), parameters->end(), index,
                                         [](const Parameter& p, std::int32_t i) { return p.index < i; });
     return found != parameters->end() && found->index == index ? &*found : nullptr;
+}
+
+std::int64_t Node::LaterTime(std::int64_t nodeTime, std::int64_t ticks) const {
+    if (const MediaDetail* media = AsMedia()) {
+        if (media->held || media->clip->info.still) return nodeTime;
+        const std::int64_t step = ScaleTicks(ticks, media->speed);
+        return media->backwards ? nodeTime - step : nodeTime + step;
+    }
+    const ItemDetail* item = AsItem();
+    return item ? item->time.LaterTransformed(nodeTime, ticks) : nodeTime + ticks;
 }
 
 std::int64_t Node::TransformTime(std::int64_t argument) const {

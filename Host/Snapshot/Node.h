@@ -99,8 +99,18 @@ struct MediaDetail {
     bool frameBlend = false;
     bool deinterlace = false;
     bool reverseFieldDominance = false;
+    /// Seconds of media a second, without its sign.
+    double speed = 1.0;
+    bool backwards = false;
+    /// One moment is shown all the time.
+    bool held = false;
     /// Frames don't map one to one, so the exact media time counts rather than a frame number.
     bool samplesTime = false;
+
+    /// How the fields of the media lie; a still has none.
+    [[nodiscard]] FieldType GetFieldType() const {
+        return clip->info.still ? FieldType::kProgressive : clip->info.fieldType;
+    }
 };
 
 struct EffectDetail {
@@ -170,6 +180,9 @@ struct Node {
     [[nodiscard]] const Parameter* FindParameter(std::int32_t index) const;
     /// The answer to the question for the node's own time: only items map.
     [[nodiscard]] std::int64_t TransformTime(std::int64_t argument) const;
+    /// What the time of a request for this node's picture (media time for media; for items what TransformTime gave for
+    /// their own time; else the node's own) becomes `ticks` later on the sequence.
+    [[nodiscard]] std::int64_t LaterTime(std::int64_t nodeTime, std::int64_t ticks) const;
 };
 
 /// A stretch of time in which one tree holds.

@@ -210,6 +210,9 @@ Node NodeFactory::StartMedia(const ClipRequest& request, const MediaClipPtr& cli
     detail.frameBlend = item.options.frameBlend && clip->id != 0;
     detail.deinterlace = item.options.deinterlace;
     detail.reverseFieldDominance = item.options.reverseFieldDominance;
+    detail.speed = request.time.ClipSpeed();
+    detail.backwards = request.time.IsBackward();
+    detail.held = request.time.motion == Motion::kFreeze;
     const bool merges =
         info.fieldType != FieldType::kProgressive && mFormat.fieldType == FieldType::kProgressive && detail.frameBlend;
     detail.samplesTime = !info.still && (info.ticksPerFrame != mFormat.frameTicks || !request.time.KeepsFrames() ||

@@ -5,6 +5,7 @@
 #include <cstdint>
 
 #include "Host/Software/Picture.h"
+#include "Vellum/FieldOrder.h"
 #include "Vellum/Geometry.h"
 
 namespace Vantrel::Host::Software {
@@ -20,6 +21,10 @@ struct View {
     std::int32_t sequenceHeight = 0;
     std::int64_t frameTicks = 0;
     std::uint32_t quality = 4;
+    /// Of the sequence.
+    std::uint32_t fieldType = Vellum::kFieldType_Progressive;
+    /// The moment that is wanted: that of one of a frame's fields, or the whole frame.
+    std::uint32_t fieldSelection = Vellum::kFieldSelection_Frame;
 
     /// Pixels of the sequence in one of the picture.
     [[nodiscard]] double ScaleX() const { return static_cast<double>(sequenceWidth) / width; }

@@ -3,7 +3,6 @@
 #include "Host/Software/MediaLayers.h"
 
 #include <algorithm>
-#include <cstdlib>
 #include <utility>
 #include <vector>
 
@@ -12,16 +11,11 @@
 #include "Host/Software/Effects/Dissolves.h"
 #include "Host/Software/Effects/FrameRepairs.h"
 #include "Host/Software/Effects/Resample.h"
-#include "Marl/TimeSampling.h"
+#include "Host/Time/ExactTime.h"
 
 namespace Vantrel::Host::Software {
 
 namespace {
-
-struct Size {
-    std::int32_t width = 0;
-    std::int32_t height = 0;
-};
 
 Vellum::PixelAspectRatio AspectOf(const MediaInfo& info) {
     return {info.pixelAspectNumerator, info.pixelAspectDenominator};
@@ -31,7 +25,7 @@ std::int32_t Rounded(double size) { return std::max(1, static_cast<std::int32_t>
 
 /// The media's size in pixels of the request. Fit takes the factor with which all of the picture is in the frame, fill
 /// the one with which it leaves nothing of the frame free, stretch each direction's own.
-Size LayerSize(const MediaInfo& info, ScalePolicy policy, const View& view) {
+MediaLayers::Size LayerSize(const MediaInfo& info, ScalePolicy policy, const View& view) {
     double factorX = view.ScaleX();
     double factorY = view.ScaleY();
     if (policy != ScalePolicy::kNone) {
@@ -45,7 +39,7 @@ Size LayerSize(const MediaInfo& info, ScalePolicy policy, const View& view) {
     return {Rounded(info.width / factorX), Rounded(info.height / factorY)};
 }
 
-Picture ScaledTo(Picture picture, Size size, Vellum::RenderQuality quality) {
+Picture ScaledTo(Picture picture, const MediaLayers::Size& size, Vellum::RenderQuality quality) {
     if (picture.width == size.width && picture.height == size.height) return picture;
     Picture scaled(size.width, size.height);
     Resample(picture, scaled, static_cast<double>(size.width) / picture.width,
@@ -53,37 +47,28 @@ Picture ScaledTo(Picture picture, Size size, Vellum::RenderQuality quality) {
     return scaled;
 }
 
-/// The instants whose frames show what happens from a media time on, with their shares: the nearest frame, or where
-/// frames are to be blended, all that one frame of the sequence covers. Fields aren't told apart.
-std::vector<Marl::TimeSample> SampleTimes(const Node& media, std::int64_t mediaTime, const View& view) {
-    const MediaDetail& detail = *media.AsMedia();
-    const Vellum::FrameRate rate = Vellum::FrameRate::Create(detail.clip->info.ticksPerFrame);
-    const bool blend = detail.frameBlend && view.quality >= 2;
-    const std::string* speed = media.FindProperty("MediaNode::ClipSpeed");
-    const Marl::TimeSpan span = Marl::CalculateDurationInMediaTime(
-        mediaTime, Vellum::FrameRate::Create(view.frameTicks), speed ? std::strtod(speed->c_str(), nullptr) : 1.0);
-    std::vector<Marl::TimeSample> samples;
-    if (!detail.samplesTime) {
-        samples.push_back({mediaTime, mediaTime, 0, 1.0});
-        return samples;
-    }
-    if (blend && !Marl::IsDegenerate(span, rate)) {
-        Marl::GetWeightedSamplesForRange(span, rate, rate, 0, samples);
-        Marl::NormalizeSampleWeights(samples);
-        return samples;
-    }
-    std::int64_t before = 0;
-    std::int64_t after = 0;
-    Marl::GetSamplesAroundTime(mediaTime, rate, blend, before, after);
-    const double share = Marl::CalculateSampleWeight(mediaTime, before, after);
-    if (share > 0.0) samples.push_back({before, before, 0, share});
-    if (share < 1.0) samples.push_back({after, after, 0, 1.0 - share});
-    return samples;
+/// Whether the first of a frame's fields, by the order that the media claim, is the one that is shown last.
+bool ExchangesFields(const MediaDetail& detail) { return detail.reverseFieldDominance != detail.backwards; }
+
+/// Whether the lines of the fields change places, because the sequence has them the other way round. A picture that is
+/// reduced is resampled anyway, which leaves nothing of its lines.
+bool PutsFieldsInOrder(const MediaDetail& detail, const View& view) {
+    const FieldType fields = detail.GetFieldType();
+    if (fields == FieldType::kProgressive || !Vellum::IsInterlaced(view.fieldType)) return false;
+    const bool reduced = detail.scale != ScalePolicy::kNone && view.sequenceHeight < detail.clip->info.height;
+    const bool upperFirst = (fields == FieldType::kTopFirst) != ExchangesFields(detail);
+    return !reduced && upperFirst != (view.fieldType == Vellum::kFieldType_UpperFirst);
+}
+
+Marl::StreamTiming TimingOf(const MediaDetail& detail) {
+    const Vellum::FrameRate frameRate = Vellum::FrameRate::Create(detail.clip->info.ticksPerFrame);
+    const bool fields = detail.GetFieldType() != FieldType::kProgressive && !detail.deinterlace;
+    return {frameRate, fields ? frameRate.Faster(2) : frameRate, detail.speed, detail.backwards};
 }
 
 }  // namespace
 
-Picture MediaLayers::ReadFrame(const MediaDetail& detail, std::int64_t frame) {
+Picture MediaLayers::ReadFrame(const MediaDetail& detail, std::int64_t frame, std::uint32_t selection) {
     const HostPictureRef source = mPictures.GetFrame(*detail.clip, detail.name, frame);
     std::uint32_t alpha = source->alphaType;
     if (detail.alpha == AlphaChoice::kIgnore) alpha = Vellum::kAlphaType_None;
@@ -96,18 +81,55 @@ Picture MediaLayers::ReadFrame(const MediaDetail& detail, std::int64_t frame) {
     if (detail.alpha == AlphaChoice::kInvert) {
         for (std::size_t i = 3; i < picture.pixels.size(); i += 4) picture.pixels[i] = 1.0F - picture.pixels[i];
     }
-    const FieldType fields = detail.clip->info.fieldType;
-    if (detail.deinterlace && fields != FieldType::kProgressive) {
-        const bool upperFirst = (fields == FieldType::kTopFirst) != detail.reverseFieldDominance;
-        Deinterlace(picture, upperFirst ? 0 : 1);
-    }
+    const FieldType fields = detail.GetFieldType();
+    if (fields == FieldType::kProgressive || selection == Vellum::kFieldSelection_Frame) return picture;
+    const bool lowerFirst = (fields == FieldType::kBottomFirst) != ExchangesFields(detail);
+    Deinterlace(picture, lowerFirst == (selection == Vellum::kFieldSelection_First) ? 1 : 0);
     return picture;
 }
 
-Picture MediaLayers::RenderExact(const MediaDetail& detail, std::int64_t mediaTime) {
+Picture MediaLayers::RenderExact(const MediaDetail& detail, const Marl::TimeSample& sample, std::uint32_t selection,
+                                 const View& view) {
     const auto* nested = std::get_if<NestedSource>(&detail.clip->source);
-    if (nested && detail.clip->id == 0) return mRenderSequence(*nested->sequence, mediaTime);
-    return ReadFrame(detail, MediaFrameAt(detail.clip->info, mediaTime));
+    Picture picture = nested && detail.clip->id == 0
+                          ? mRenderNested(*nested->sequence, sample.time, selection)
+                          : ReadFrame(detail, MediaFrameAt(detail.clip->info, sample.frameTime), selection);
+    if (PutsFieldsInOrder(detail, view)) ReverseFields(picture);
+    return picture;
+}
+
+Picture MediaLayers::Sum(const MediaDetail& detail, const std::vector<Marl::TimeSample>& samples, const Size& size,
+                         const View& view) {
+    std::vector<Picture> pictures;
+    std::vector<double> weights;
+    for (const Marl::TimeSample& sample : samples) {
+        const std::uint32_t selection =
+            sample.time == sample.frameTime ? Vellum::kFieldSelection_First : Vellum::kFieldSelection_Second;
+        pictures.push_back(ScaledTo(RenderExact(detail, sample, selection, view), size, view.Quality()));
+        weights.push_back(sample.weight);
+    }
+    return pictures.size() == 1 ? std::move(pictures.front()) : WeightedSum(pictures, weights);
+}
+
+Picture MediaLayers::Show(const Node& media, std::int64_t mediaTime, const Size& size, const View& view) {
+    const MediaDetail& detail = *media.AsMedia();
+    if (!detail.samplesTime) {
+        std::uint32_t selection = view.fieldSelection;
+        const std::int64_t fieldTicks = Vellum::HalfFrameTicks(detail.clip->info.ticksPerFrame);
+        if (detail.held) selection = static_cast<std::uint32_t>(FrameNumberAt(mediaTime, fieldTicks)) & 1U;
+        return ScaledTo(RenderExact(detail, {mediaTime, mediaTime}, selection, view), size, view.Quality());
+    }
+    const Vellum::FrameRate frameRate = Vellum::FrameRate::Create(view.frameTicks);
+    const Marl::StreamTiming timing = TimingOf(detail);
+    const bool interlaced = Vellum::IsInterlaced(view.fieldType);
+    const Marl::SampledOutput output{frameRate, interlaced ? frameRate.Faster(2) : frameRate,
+                                     detail.frameBlend && view.quality >= 2};
+    Picture picture = Sum(detail, Marl::SampleMoment(mediaTime, timing, output), size, view);
+    if (!interlaced || view.fieldSelection != Vellum::kFieldSelection_Frame) return picture;
+    const std::int64_t laterTime = media.LaterTime(mediaTime, output.pictureRate.GetTicksPerFrame());
+    const Picture later = Sum(detail, Marl::SampleMoment(laterTime, timing, output), size, view);
+    WeaveField(picture, later, view.fieldType == Vellum::kFieldType_UpperFirst);
+    return picture;
 }
 
 LayerPicture MediaLayers::Render(const Node& media, std::int64_t mediaTime, const View& view) {
@@ -115,13 +137,7 @@ LayerPicture MediaLayers::Render(const Node& media, std::int64_t mediaTime, cons
     const MediaInfo& info = detail.clip->info;
     const Size size = LayerSize(info, detail.scale, view);
     LayerPicture layer;
-    std::vector<Picture> pictures;
-    std::vector<double> weights;
-    for (const Marl::TimeSample& sample : SampleTimes(media, mediaTime, view)) {
-        pictures.push_back(ScaledTo(RenderExact(detail, sample.time), size, view.Quality()));
-        weights.push_back(sample.weight);
-    }
-    layer.picture = pictures.size() == 1 ? std::move(pictures.front()) : WeightedSum(pictures, weights);
+    layer.picture = Show(media, mediaTime, size, view);
     layer.aspect = AspectOf(info);
     layer.origin = {(size.width - Rounded(view.sequenceWidth / view.ScaleX())) / 2,
                     (size.height - Rounded(view.sequenceHeight / view.ScaleY())) / 2};

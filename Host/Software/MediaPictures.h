@@ -20,7 +20,8 @@ namespace Vantrel::Host::Software {
 /// Frames of media of every kind, undecorated, in the media's own size. May be used from several threads at once.
 class MediaPictures {
 public:
-    /// Renders a sequence at its own size; called from the thread that asked for a frame of it.
+    /// Renders a frame of a sequence at its own size, with both fields if it is interlaced; called from the thread that
+    /// asked for it.
     using SequenceRenderer = std::function<Picture(const Sequence& sequence, std::int64_t time)>;
 
     MediaPictures(std::shared_ptr<PixelBufferPool> pool, std::shared_ptr<MediaReader> reader,

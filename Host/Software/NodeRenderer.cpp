@@ -16,9 +16,14 @@ namespace Vantrel::Host::Software {
 namespace {
 
 View ViewOf(const SequenceFormat& format, std::uint32_t quality) {
-    return {format.width, format.height, {format.aspectNumerator, format.aspectDenominator},
-            format.width, format.height, format.frameTicks,
-            quality};
+    return {format.width,
+            format.height,
+            {format.aspectNumerator, format.aspectDenominator},
+            format.width,
+            format.height,
+            format.frameTicks,
+            quality,
+            static_cast<std::uint32_t>(format.fieldType)};
 }
 
 /// An angle is rendered as large as the whole monitor, or as its half beside the programme.
@@ -43,8 +48,11 @@ LayerPicture AsLayer(Picture picture, const View& view) {
 
 NodeRenderer::NodeRenderer(std::shared_ptr<PixelBufferPool> pool, std::shared_ptr<MediaReader> reader, bool strict)
     : mPictures(std::move(pool), std::move(reader),
-                [this](const Sequence& sequence, std::int64_t time) { return RenderSequence(sequence, time); }),
-      mMedia(mPictures, [this](const Sequence& sequence, std::int64_t time) { return RenderSequence(sequence, time); }),
+                [this](const Sequence& sequence, std::int64_t time) { return RenderWholeFrame(sequence, time); }),
+      mMedia(mPictures,
+             [this](const Sequence& sequence, std::int64_t time, std::uint32_t fieldSelection) {
+                 return RenderSequence(sequence, time, fieldSelection);
+             }),
       mEffects(strict) {}
 
 Picture NodeRenderer::RenderFrame(const Node& node, std::int64_t time, const View& view) {
@@ -58,8 +66,19 @@ Picture NodeRenderer::RenderOperators(const Node& clip, const ItemTimes& times, 
         .picture;
 }
 
-Picture NodeRenderer::RenderSequence(const Sequence& sequence, std::int64_t time) {
-    const View view = ViewOf(sequence.format, 4);
+Picture NodeRenderer::RenderWholeFrame(const Sequence& sequence, std::int64_t time) {
+    const auto fieldType = static_cast<std::uint32_t>(sequence.format.fieldType);
+    if (!Vellum::IsInterlaced(fieldType)) return RenderSequence(sequence, time, Vellum::kFieldSelection_Frame);
+    Picture picture = RenderSequence(sequence, time, Vellum::kFieldSelection_First);
+    const std::int64_t later = time + Vellum::HalfFrameTicks(sequence.format.frameTicks);
+    WeaveField(picture, RenderSequence(sequence, later, Vellum::kFieldSelection_Second),
+               fieldType == Vellum::kFieldType_UpperFirst);
+    return picture;
+}
+
+Picture NodeRenderer::RenderSequence(const Sequence& sequence, std::int64_t time, std::uint32_t fieldSelection) {
+    View view = ViewOf(sequence.format, 4);
+    view.fieldSelection = fieldSelection;
     const Segment* segment = sequence.plain.Find(time);
     if (!segment) return Picture(view.width, view.height);
     return RenderFrame(*segment->root, time - segment->start + segment->offset, view);

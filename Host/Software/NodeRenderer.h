@@ -31,7 +31,9 @@ private:
     [[nodiscard]] LayerPicture RenderLayer(const Node& node, std::int64_t time, const View& view);
     [[nodiscard]] LayerPicture RenderClip(const Node& clip, const ItemTimes& times, std::size_t endOperator,
                                           const View& view);
-    [[nodiscard]] Picture RenderSequence(const Sequence& sequence, std::int64_t time);
+    /// A frame of a sequence with both its fields, and a picture of one of its moments.
+    [[nodiscard]] Picture RenderWholeFrame(const Sequence& sequence, std::int64_t time);
+    [[nodiscard]] Picture RenderSequence(const Sequence& sequence, std::int64_t time, std::uint32_t fieldSelection);
     [[nodiscard]] Picture RenderInput(const NodeInput& input, std::int64_t time, const View& view);
     [[nodiscard]] Picture Composite(const Node& compositor, std::int64_t time, const View& view);
     [[nodiscard]] Picture RenderBetween(const Node& transition, std::int64_t time, const View& view);

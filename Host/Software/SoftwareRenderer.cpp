@@ -8,6 +8,7 @@
 
 #include "Host/Render/FinishedFrame.h"
 #include "Host/Snapshot/Fingerprint.h"
+#include "Host/Software/Effects/FrameRepairs.h"
 #include "Host/Software/NodeRenderer.h"
 
 namespace Vantrel::Host {
@@ -30,8 +31,10 @@ Software::View ViewOf(const SequenceSize& sequence, const VantrelRenderDescripti
     }
     Vellum::PixelAspectRatio aspect{description.aspectNumerator, description.aspectDenominator};
     if (aspect.numerator <= 0 || aspect.denominator <= 0) aspect = Vellum::kPixelAspectRatio_Square;
-    return {description.width,   description.height, aspect, sequence.width, sequence.height,
-            sequence.frameTicks, description.quality};
+    Software::View view{description.width,   description.height, aspect, sequence.width, sequence.height,
+                        sequence.frameTicks, description.quality};
+    if (Vellum::IsInterlaced(description.fieldType)) view.fieldType = description.fieldType;
+    return view;
 }
 
 class SoftwareRenderer : public ISoftwareRenderer {
@@ -45,25 +48,57 @@ public:
 
     HostPictureRef RenderNode(const Node& node, std::int64_t nodeTime, const SequenceSize& sequence,
                               const VantrelRenderDescription& description) override {
-        const Software::View view = ViewOf(sequence, description);
-        if (node.kind != NodeKind::kClip) return Finish(mNodes.RenderFrame(node, nodeTime, view), description);
-        const ItemTimes times = node.AsItem()->time.FromTransformed(nodeTime);
-        return Finish(mNodes.RenderOperators(node, times, node.operators.size(), view), description);
+        const auto render = [&](std::int64_t ticks, const Software::View& view) {
+            const std::int64_t time = ticks == 0 ? nodeTime : node.LaterTime(nodeTime, ticks);
+            if (node.kind != NodeKind::kClip) return mNodes.RenderFrame(node, time, view);
+            return mNodes.RenderOperators(node, node.AsItem()->time.FromTransformed(time), node.operators.size(), view);
+        };
+        const auto fingerprint = [&](std::int64_t ticks, const VantrelRenderDescription& one) {
+            return NodeFingerprint(node, ticks == 0 ? nodeTime : node.LaterTime(nodeTime, ticks), one);
+        };
+        return RenderFields(render, fingerprint, sequence, description);
     }
 
     HostPictureRef RenderOperators(const Node& clip, std::int32_t endOperator, std::int64_t rawTime,
                                    const SequenceSize& sequence, const VantrelRenderDescription& description) override {
         if (!clip.AsItem()) throw std::invalid_argument("operators of a node that isn't a clip were asked for");
         const auto end = static_cast<std::size_t>(std::max(endOperator, 0));
-        return Finish(
-            mNodes.RenderOperators(clip, TimesOfRawTime(*clip.AsItem(), rawTime), end, ViewOf(sequence, description)),
-            description);
+        const auto render = [&](std::int64_t ticks, const Software::View& view) {
+            return mNodes.RenderOperators(clip, TimesOfRawTime(*clip.AsItem(), rawTime + ticks), end, view);
+        };
+        const auto fingerprint = [&](std::int64_t ticks, const VantrelRenderDescription& one) {
+            return OperatorsFingerprint(clip, endOperator, rawTime + ticks, one);
+        };
+        return RenderFields(render, fingerprint, sequence, description);
     }
 
     std::vector<std::string> GetPassedThrough() const override { return mNodes.GetPassedThrough(); }
 
 private:
-    HostPictureRef Finish(const Software::Picture& picture, const VantrelRenderDescription& description) const {
+    /// An interlaced picture shows two moments, unless nothing happens between them. At draft quality it is made like a
+    /// progressive one.
+    template <class Render, class Fingerprint>
+    HostPictureRef RenderFields(const Render& render, const Fingerprint& fingerprint, const SequenceSize& sequence,
+                                const VantrelRenderDescription& description) const {
+        Software::View view = ViewOf(sequence, description);
+        const std::int64_t fieldTicks = Vellum::HalfFrameTicks(sequence.frameTicks);
+        const bool interlaced = Vellum::IsInterlaced(view.fieldType);
+        if (!interlaced || fingerprint(0, description) == fingerprint(fieldTicks, description)) {
+            return Finish(render(0, view), description);
+        }
+        if (description.quality >= 2) view.fieldSelection = Vellum::kFieldSelection_First;
+        Software::Picture picture = render(0, view);
+        if (description.quality >= 2) {
+            view.fieldSelection = Vellum::kFieldSelection_Second;
+            Software::WeaveField(picture, render(fieldTicks, view), view.fieldType == Vellum::kFieldType_UpperFirst);
+        }
+        const auto finished = Finish(picture, description);
+        finished->fieldType = view.fieldType;
+        return finished;
+    }
+
+    std::shared_ptr<HostPicture> Finish(const Software::Picture& picture,
+                                        const VantrelRenderDescription& description) const {
         auto finished = Software::ToHostPicture(*mPool, picture, ChooseFormat(description));
         finished->aspect = {description.aspectNumerator, description.aspectDenominator};
         if (description.compositeOnBlack != 0) LayOverBlack(*finished);

@@ -83,6 +83,17 @@ ItemTimes TimeMap::FromTransformed(std::int64_t transformed) const {
     return AtItemTime(transformed - in);
 }
 
+std::int64_t TimeMap::LaterTransformed(std::int64_t transformed, std::int64_t ticks) const {
+    if (motion != Motion::kRemap) {
+        const ItemTimes times = FromTransformed(transformed);
+        return Transform(times.item + ticks);
+    }
+    for (std::int64_t t = 0; frameTicks > 0 && t < duration; t += frameTicks) {
+        if (Transform(t) == transformed) return Transform(t + ticks);
+    }
+    return transformed;
+}
+
 double TimeMap::ClipSpeed() const {
     if (motion == Motion::kForward || motion == Motion::kBackward) return std::fabs(speed);
     if (motion != Motion::kRemap || duration <= 0) return 1.0;

@@ -73,6 +73,9 @@ struct TimeMap {
     /// item's own time can't be had back, and nothing reads it.
     [[nodiscard]] ItemTimes FromTransformed(std::int64_t transformed) const;
 
+    /// Transform(t + ticks), from Transform(t). On a remapped item the first frame with that answer stands for t.
+    [[nodiscard]] std::int64_t LaterTransformed(std::int64_t transformed, std::int64_t ticks) const;
+
     /// Speed without its sign; the mean one of a remapped item.
     [[nodiscard]] double ClipSpeed() const;
     [[nodiscard]] bool IsBackward() const { return motion == Motion::kBackward; }

@@ -30,6 +30,7 @@ Film RenderFilm(const std::string& file, const FilmOptions& options) {
     SessionOptions session;
     session.file = file;
     session.snapshot.mediaRoots = options.mediaRoots;
+    session.snapshot.previews = options.previews;
     session.device = options.device;
     session.deviceMemory = options.deviceMemory;
     RenderSession render(session);
@@ -56,6 +57,8 @@ Film RenderFilm(const std::string& file, const FilmOptions& options) {
         film.summary = render.Render(
             job, [&film](RenderedFrame frame) { film.pictures.push_back(frame.picture); }, stop);
     }
+    // The device outlives the session.
+    if (options.deviceMemory != 0) render.GetDevice()->SetMemoryLimit(UINT64_MAX);
     film.failures = render.GetService().GetFailures();
     return film;
 }

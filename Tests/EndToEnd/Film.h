@@ -38,6 +38,7 @@ public:
 struct FilmOptions {
     DeviceChoice device = DeviceChoice::kCuda;
     std::vector<std::string> mediaRoots;
+    std::string previews;    ///< a folder
     std::int32_t width = 0;  ///< 0: the sequence's
     std::int32_t height = 0;
     std::uint32_t quality = 4;

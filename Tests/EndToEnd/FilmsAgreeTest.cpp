@@ -53,9 +53,9 @@ TEST_F(FilmsAgree, OnBothFrameworksAtEveryQuality) {
     for (const std::uint32_t quality : {1U, 2U, 3U, 4U}) {
         options.quality = quality;
         options.device = DeviceChoice::kCuda;
-        const Film cuda = RenderFilm(VANTREL_EXAMPLE, options);
+        const Film cuda = RenderFilm(VANTREL_EXAMPLES "/first-cut/first-cut.otio", options);
         options.device = DeviceChoice::kOpenCL;
-        const Film opencl = RenderFilm(VANTREL_EXAMPLE, options);
+        const Film opencl = RenderFilm(VANTREL_EXAMPLES "/first-cut/first-cut.otio", options);
         EXPECT_TRUE(cuda.failures.empty() && opencl.failures.empty());
         const Difference worst = Compare(cuda, opencl);
         // At the lowest quality CUDA works in half floats, whose steps near white are half a level wide.
@@ -67,7 +67,8 @@ TEST_F(FilmsAgree, StructuresOnBothFrameworksAndOnTheHost) {
     const struct {
         const char* name;
         std::vector<std::int64_t> frames;
-    } examples[] = {{"adjustment", {10, 40, 70}}, {"multicam", {5, 25, 45, 65}}, {"nested", {5, 30, 60}}};
+    } examples[] = {{"adjustment", {10, 40, 70}}, {"multicam", {5, 25, 45, 65}},       {"nested", {5, 30, 60}},
+                    {"time", {3, 24, 51}},        {"interlaced", {3, 26, 49, 63, 90}}, {"titles", {24, 80, 110}}};
     for (const auto& example : examples) {
         SCOPED_TRACE(example.name);
         const std::string file = std::string(VANTREL_EXAMPLES) + "/" + example.name + "/" + example.name + ".otio";
