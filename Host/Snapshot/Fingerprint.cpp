@@ -115,7 +115,7 @@ private:
         mHasher.Number(media.frameBlend)
             .Number(media.deinterlace)
             .Number(media.reverseFieldDominance)
-            .Number(media.held);
+            .Number(media.held && media.GetFieldType() != FieldType::kProgressive);
         mHasher.Number(clip.info.width).Number(clip.info.height);
         const auto* nested = std::get_if<NestedSource>(&clip.source);
         if (nested != nullptr && clip.id == 0 && !media.samplesTime) return Nested(*nested->sequence, time);

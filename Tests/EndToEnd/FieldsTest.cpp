@@ -95,7 +95,7 @@ TEST_P(Fields, AreTakenInTheOtherOrderOnDemand) {
     }
 }
 
-std::string Run(const std::string& command) {
+std::string OutputOf(const std::string& command) {
     std::string text;
     FILE* pipe = popen(command.c_str(), "r");
     char line[256];
@@ -109,12 +109,12 @@ TEST(InterlacedFilms, SayInWhichOrderTheirFieldsCome) {
         for (const std::uint32_t order : {0U, 1U, 2U}) {
             const std::string path = folder.Path("film" + std::to_string(order) + "." + extension);
             WriteBarFilm(path, order, order);
-            const std::string frames =
-                Run("ffprobe -v error -select_streams v -show_entries "
-                    "frame=interlaced_frame,top_field_first -of csv=p=0 " +
-                    path);
+            const std::string frames = OutputOf(
+                "ffprobe -v error -select_streams v -show_entries "
+                "frame=interlaced_frame,top_field_first -of default=nw=1:nk=1 " +
+                path);
             std::string expected;
-            for (int i = 0; i < kBarFrames; ++i) expected += order == 0 ? "0,0\n" : order == 1 ? "1,1\n" : "1,0\n";
+            for (int i = 0; i < kBarFrames; ++i) expected += order == 0 ? "0\n0\n" : order == 1 ? "1\n1\n" : "1\n0\n";
             EXPECT_EQ(frames, expected) << path;
             const MediaProbeResult probed = FFmpegProbe().ProbeFile(path);
             ASSERT_TRUE(probed.info) << probed.error;

@@ -20,10 +20,11 @@ protected:
         WriteTestMedia({{"a.mov", 0, 20, kFrame}, {"b.mov", 100, 20, kFrame}}, mFolder.Path(""),
                        [](const std::string&) {});
         const Json cut = Timeline(
-            {Track({Clip("a", Range(2, 12), File("a.mov", 0, 20)), Clip("b", Range(0, 4), File("b.mov", 100, 20))}),
+            {Track({Clip("a", Range(2, 12), File("a.mov", 0, 20)), Clip("b", Range(0, 4), File("b.mov", 0, 20))}),
              Track({Gap(5), Clip("t", Range(0, 2), GeneratorOf("transparent"))})},
             Own({{"sequence", {{"width", 320}, {"height", 180}, {"rate", kRate}}}}));
         std::ofstream(mFile) << cut.dump();
+        mOptions.previews = mFolder.Path("previews");
         std::filesystem::create_directory(mOptions.previews);
         mOptions.device = GetParam();
         mOptions.mediaRoots = {mFolder.Path("")};
@@ -67,7 +68,7 @@ protected:
     }
 
     std::string mFile = mFolder.Path("cut.otio");
-    FilmOptions mOptions{DeviceChoice::kCuda, {}, mFolder.Path("previews")};
+    FilmOptions mOptions;
 };
 
 INSTANTIATE_TEST_SUITE_P(OnEachDevice, Previews, testing::Values(DeviceChoice::kCuda, DeviceChoice::kOpenCL),

@@ -372,10 +372,11 @@ TEST(Structure, OperatorsEndWhereTheRequestSays) {
         {Track({Solid(255, 85, 0, 10, Effects({Effect("TQ.XQVE Invert"), Effect("lavfi:negate"), Opacity(50)}))})},
         Format(16, 8)));
     const Host::Node& clip = *stage.SegmentAt(0).root->inputs[0].node;
-    ASSERT_EQ(clip.operators.size(), 3U);
-    const std::array<std::array<double, 4>, 4> expected{
-        {{1, kThird, 0, 1}, {0, kTwoThirds, 1, 1}, {1, kThird, 0, 1}, {1, kThird, 0, 0.5}}};
-    for (int end = 0; end <= 3; ++end) {
+    // A neutral motion follows the opacity.
+    ASSERT_EQ(clip.operators.size(), 4U);
+    const std::array<std::array<double, 4>, 5> expected{
+        {{1, kThird, 0, 1}, {0, kTwoThirds, 1, 1}, {1, kThird, 0, 1}, {1, kThird, 0, 0.5}, {1, kThird, 0, 0.5}}};
+    for (int end = 0; end <= 4; ++end) {
         const auto picture = stage.GetRenderer().RenderOperators(clip, end, 0, stage.GetSize(), stage.Describe(16, 8));
         const auto* pixel = reinterpret_cast<const float*>(picture->GetRow(4)) + 4 * 8;
         const auto& rgba = expected[static_cast<std::size_t>(end)];
