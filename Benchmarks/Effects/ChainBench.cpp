@@ -26,7 +26,7 @@ using namespace Vantrel;
 using Records = std::vector<PointwiseFilterRecord>;
 
 constexpr std::int32_t kWidth = 1920, kHeight = 1080;
-constexpr int kRounds = 25;
+constexpr int kRounds = 15;
 constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Effects\\PointwiseFilterHostNode";
 EffectKernel gKernels[] = {{kModuleKey, "PointwiseFilterHostKernel1", {}},
                            {kModuleKey, "PointwiseFilterHostKernel2", {}},
