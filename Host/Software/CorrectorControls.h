@@ -37,6 +37,12 @@ struct CorrectorIndices {
     return selection;
 }
 
+inline void ReadSplitView(const EffectContext& context, std::int32_t first, Corrector& corrector) {
+    if (!context.Flag(first)) return;
+    const bool columns = context.Integer(first + 1) == kSplitLayout_Columns;
+    (columns ? corrector.columns : corrector.rows) = context.Number(first + 2) / 100.0;
+}
+
 [[nodiscard]] inline Corrector ReadCorrector(const EffectContext& context, const LayerPicture& layer,
                                              const CorrectorIndices& indices) {
     Corrector corrector;
@@ -47,10 +53,7 @@ struct CorrectorIndices {
     } else {
         corrector.output = context.Integer(0);
     }
-    if (context.Flag(indices.splitView)) {
-        const bool columns = context.Integer(indices.splitView + 1) == kSplitLayout_Columns;
-        (columns ? corrector.columns : corrector.rows) = context.Number(indices.splitView + 2) / 100.0;
-    }
+    ReadSplitView(context, indices.splitView, corrector);
     for (std::int32_t i = 0; i < 4 && indices.tonalRange >= 0; ++i) {
         corrector.range[static_cast<std::size_t>(i)] = context.Number(indices.tonalRange + i) / 255.0;
     }

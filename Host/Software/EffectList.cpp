@@ -4,9 +4,12 @@
 
 #include "Host/Software/CorrectorControls.h"
 #include "Host/Software/EffectContext.h"
+#include "Host/Software/Effects/Curves.h"
 #include "Host/Software/Effects/Invert.h"
+#include "Host/Software/Effects/Levels.h"
 #include "Host/Software/Effects/LumaCorrector.h"
 #include "Host/Software/Effects/PointwiseFilters.h"
+#include "Host/Software/Effects/VideoLimiter.h"
 #include "Vantrel/Effects/Invert.h"
 
 /// The one place that knows which scalar function is which effect: it reads parameters and calls.
@@ -36,6 +39,10 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
     static const std::map<std::string, EffectFunction> kFunctions = {
         {"TQ.XQVE Invert", RunInvert},
         {"TQ.XQVE Luma Corrector", RunLumaCorrector},
+        {"TQ.XQVE Luma Curve", RunLumaCurve},
+        {"TQ.XQVE RGB Curves", RunRGBCurves},
+        {"KL.XQVE Levels", RunLevels},
+        {"TQ.XQVE Video Limiter", RunVideoLimiter},
         {"TQ.XQVE Alpha Adjust", RunAlphaAdjust},
         {"KL.XQVE Black & White", RunBlackAndWhite},
         {"TQ.XQVE Brightness & Contrast 2", RunBrightnessContrast},

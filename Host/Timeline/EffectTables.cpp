@@ -154,53 +154,6 @@ EffectTable ThreeWayColorCorrector() {
     return table.Finish();
 }
 
-/// Sixteen control points from `first` on: a straight line, and the rest unused.
-void AddCurve(Builder& table, std::int32_t first, const std::string& prefix) {
-    constexpr std::int32_t kPoints = 16;
-    for (std::int32_t i = 0; i < kPoints; ++i) {
-        const double value = i == 1 ? kFullScale : 0;
-        table.Row(first + 2 * i, prefix + "x" + std::to_string(i), Type::kDouble, {value});
-        table.Row(first + 2 * i + 1, prefix + "y" + std::to_string(i), Type::kDouble, {value});
-    }
-}
-
-EffectTable LumaCurve() {
-    Builder table("TQ.XQVE Luma Curve");
-    AddCorrectorHead(table);
-    AddCurve(table, 5, "");
-    table.Row(40, "show_mask", Type::kBool);
-    AddSecondary(table, 45);
-    return table.Finish();
-}
-
-EffectTable RgbCurves() {
-    Builder table("TQ.XQVE RGB Curves");
-    AddCorrectorHead(table);
-    std::int32_t first = 5;
-    for (const char* prefix : {"master_", "red_", "green_", "blue_"}) {
-        AddCurve(table, first, prefix);
-        first += 32;
-    }
-    table.Row(136, "show_mask", Type::kBool);
-    AddSecondary(table, 141);
-    return table.Finish();
-}
-
-EffectTable Levels() {
-    Builder table("KL.XQVE Levels");
-    std::int32_t index = 0;
-    for (const std::string group : {"rgb", "red", "green", "blue"}) {
-        for (const auto& [name, value] : {std::pair{"black_in", 0.0},
-                                          {"white_in", kFullScale},
-                                          {"black_out", 0.0},
-                                          {"white_out", kFullScale},
-                                          {"gamma", 100.0}}) {
-            table.Row(index++, group + "_" + name, Type::kInt, {value});
-        }
-    }
-    return table.Finish();
-}
-
 /// A polygon of `count` corners that goes round the frame's edge clockwise from the top left.
 EffectTable GarbageMatte(const char* matchName, std::int32_t count) {
     Builder table(matchName);
@@ -221,24 +174,6 @@ EffectTable UltraKey() {
     table.Rows(11, Type::kDouble, {{"choke", 0}, {"soften", 0}, {"contrast", 0}, {"mid_point", 50}});
     table.Rows(17, Type::kDouble, {{"desaturate", 25}, {"range", 50}, {"spill", 50}, {"luma", 50}});
     table.Rows(23, Type::kDouble, {{"saturation", 100}, {"hue", 0}, {"luminance", 100}});
-    return table.Finish();
-}
-
-EffectTable VideoLimiter() {
-    Builder table("TQ.XQVE Video Limiter");
-    table.Row(0, "split_view", Type::kBool)
-        .Row(1, "split_layout", Type::kInt)
-        .Row(2, "split_percent", Type::kDouble, {50});
-    table.Row(3, "reduction_axis", Type::kInt);
-    table.Rows(4, Type::kDouble,
-               {{"luma_min", 0},
-                {"luma_max", 100},
-                {"chroma_min", 0},
-                {"chroma_max", 100},
-                {"signal_min", 0},
-                {"signal_max", 100}});
-    table.Row(10, "reduction_method", Type::kInt);
-    AddTonalRange(table, 13);
     return table.Finish();
 }
 
@@ -317,10 +252,6 @@ std::vector<EffectTable> MakeTables() {
     AddSpatial(tables);
     tables.push_back(RgbColorCorrector());
     tables.push_back(ThreeWayColorCorrector());
-    tables.push_back(LumaCurve());
-    tables.push_back(RgbCurves());
-    tables.push_back(Levels());
-    tables.push_back(VideoLimiter());
     tables.push_back(UltraKey());
     tables.push_back(Timecode());
     return tables;

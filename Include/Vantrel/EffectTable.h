@@ -10,6 +10,7 @@
 #include "Vantrel/Effects/ColorBalance.h"
 #include "Vantrel/Effects/ColorPass.h"
 #include "Vantrel/Effects/ColorReplace.h"
+#include "Vantrel/Effects/Curves.h"
 #include "Vantrel/Effects/EdgeFeather.h"
 #include "Vantrel/Effects/Extract.h"
 #include "Vantrel/Effects/FastColorCorrector.h"
@@ -17,10 +18,12 @@
 #include "Vantrel/Effects/GammaCorrection.h"
 #include "Vantrel/Effects/Intrinsics.h"
 #include "Vantrel/Effects/Invert.h"
+#include "Vantrel/Effects/Levels.h"
 #include "Vantrel/Effects/LumaCorrector.h"
 #include "Vantrel/Effects/Noise.h"
 #include "Vantrel/Effects/ProcAmp.h"
 #include "Vantrel/Effects/Tint.h"
+#include "Vantrel/Effects/VideoLimiter.h"
 
 /// The effects and their parameters as data, the one place where an index, a name or a default is told: nodes read by
 /// these indices, hosts read files and list effects by these rows. An effect is a header in Vantrel/Effects and a line
@@ -32,6 +35,10 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kOpacityEffect,
     &kInvertEffect,
     &kLumaCorrectorEffect,
+    &kLumaCurveEffect,
+    &kRGBCurvesEffect,
+    &kLevelsEffect,
+    &kVideoLimiterEffect,
     &kAlphaAdjustEffect,
     &kBlackAndWhiteEffect,
     &kBrightnessContrastEffect,

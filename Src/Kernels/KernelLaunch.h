@@ -108,6 +108,26 @@ template <class... Parameters>
     return device->GetCommands()->Launch(kernel, grid.x, grid.y, block.x, block.y, 0);
 }
 
+/// As Launch2D, for lists too long to state: each value goes as it is, an array as its numbers.
+template <class... Values>
+[[nodiscard]] Status LaunchList(const Kiln::DeviceRef& device, std::uint64_t kernel, GridSize grid,
+                                const Values&... values) {
+    KernelArgs args(device->GetFramework(), kernel);
+    const auto add = [&args](const auto& value) {
+        using Value = std::decay_t<decltype(value)>;
+        if constexpr (std::is_arithmetic_v<Value> || std::is_same_v<Value, Vellum::PixelFormat>) {
+            args.AddAll(value);
+        } else {
+            for (const auto& number : value) args.AddAll(number);
+        }
+    };
+    (add(values), ...);
+    const Status status = args.Finish();
+    if (Ostrand::Failed(status)) return status;
+    const BlockSize block;
+    return device->GetCommands()->Launch(kernel, grid.x, grid.y, block.x, block.y, 0);
+}
+
 /// Bytes of a pixel in a device frame; 0 for a format that no device renders in.
 [[nodiscard]] std::int32_t BytesPerPixel(Vellum::PixelFormat format);
 

@@ -11,8 +11,12 @@
 #include "Src/Filters/CompositorNode.h"
 #include "Src/Filters/DisabledNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
+#include "Src/Filters/Effects/LevelsNode.h"
 #include "Src/Filters/Effects/LumaCorrectorNode.h"
+#include "Src/Filters/Effects/LumaCurveNode.h"
 #include "Src/Filters/Effects/PointwiseFilterHostNode.h"
+#include "Src/Filters/Effects/RGBCurvesNode.h"
+#include "Src/Filters/Effects/VideoLimiterNode.h"
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/IntrinsicNode.h"
 #include "Src/Filters/MediaNode.h"
@@ -57,6 +61,10 @@ constexpr RegistryEntry kEntries[] = {
     {u"DisabledNode", Make<DisabledNode>},
     {u"TQ.XQVE Invert", Make<InvertNode>},
     {u"TQ.XQVE Luma Corrector", Make<LumaCorrectorNode>},
+    {u"TQ.XQVE Luma Curve", Make<LumaCurveNode>},
+    {u"TQ.XQVE RGB Curves", Make<RGBCurvesNode>},
+    {u"KL.XQVE Levels", Make<LevelsNode>},
+    {u"TQ.XQVE Video Limiter", Make<VideoLimiterNode>},
     {u"TQ.XQVE Alpha Adjust", Make<PointwiseFilterHostNode>},
     {u"KL.XQVE Black & White", Make<PointwiseFilterHostNode>},
     {u"TQ.XQVE Brightness & Contrast 2", Make<PointwiseFilterHostNode>},

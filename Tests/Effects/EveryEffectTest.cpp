@@ -47,6 +47,7 @@ std::array<double, 4> RandomValue(Random& random, const ParameterRow& row) {
             break;
         default:
             value[0] = random.Int(static_cast<int>(row.minimum), static_cast<int>(row.maximum));
+            if (row.choiceName && !row.choiceName(static_cast<std::int32_t>(value[0]))) value = row.value;
     }
     return value;
 }
@@ -132,6 +133,11 @@ protected:
 
 constexpr EffectCase kCases[] = {
     {"TQ.XQVE Luma Corrector", 0.01},
+    // Steep curves, and narrow levels under a power, stretch the rounding of what they are given.
+    {"TQ.XQVE Luma Curve", 0.05},
+    {"TQ.XQVE RGB Curves", 0.05},
+    {"KL.XQVE Levels", 0.02},
+    {"TQ.XQVE Video Limiter", 0.01, false},
     {"TQ.XQVE Alpha Adjust"},
     {"KL.XQVE Black & White", 0.0, false},
     {"TQ.XQVE Brightness & Contrast 2"},
