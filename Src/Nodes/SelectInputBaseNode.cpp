@@ -20,8 +20,19 @@ Status SelectInputBaseNode::CancelHostFrames(const RenderParams& params, const R
     return choice.input->CancelHostFrames(choice.params, results);
 }
 
+Status SelectInputBaseNode::RenderFrame(const RenderToken& token, const RenderParams& params,
+                                        const RenderResultsRef& results, VideoFrameRef& frame) {
+    mEnded = {};
+    return FilterNode::RenderFrame(token, params, results, frame);
+}
+
 Status SelectInputBaseNode::EndFrame(const RenderToken& token, const RenderParams& params,
                                      const RenderResultsRef& results, std::uint32_t level) {
+    const bool isEnded = mEnded.results == results.get() && mEnded.time == params.time &&
+                         mEnded.clipTime == params.clipTime && mEnded.fieldSelection == params.fieldSelection &&
+                         mEnded.level == level;
+    if (isEnded && results) return Ostrand::kStatus_OK;
+    mEnded = {results.get(), params.time, params.clipTime, params.fieldSelection, level};
     const Choice choice = Choose(params);
     FilterNode::EndFrame(token, choice.params, results, level);
     // A second end of input 0, when that is the choice, finds nothing left to do.

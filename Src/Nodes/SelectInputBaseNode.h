@@ -13,6 +13,8 @@ public:
     using FilterNode::FilterNode;
 
     Status CancelHostFrames(const RenderParams& params, const RenderResultsRef& results) override;
+    Status RenderFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
+                       VideoFrameRef& frame) override;
     Status EndFrame(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results,
                     std::uint32_t level) override;
     Status Render(const RenderToken& token, const RenderParams& params, const RenderResultsRef& results) override;
@@ -29,6 +31,17 @@ private:
         RenderNodeRef input;
     };
     [[nodiscard]] Choice Choose(const RenderParams& params);
+
+    /// The end that this node has passed on last. Input 0 is ended twice where it is the choice; without this, a choice
+    /// below a choice would be ended four times, and so on down. Render thread only.
+    struct EndedFrame {
+        const RenderResults* results = nullptr;
+        std::int64_t time = 0;
+        std::int64_t clipTime = 0;
+        std::uint32_t fieldSelection = 0;
+        std::uint32_t level = 0;
+    };
+    EndedFrame mEnded;
 };
 
 }  // namespace Vantrel

@@ -121,6 +121,22 @@ TEST(SelectInput, ThePictureComesFromTheChoice) {
     EXPECT_THROW(node->RequestHostFrames(stage.params, stage.results), Ostrand::NullInterfaceException);
 }
 
+TEST(SelectInput, AChoiceThatIsInputZeroEndsTwiceHoweverDeepItLies) {
+    ProbeStage stage;
+    RenderNodeRef top = stage.Leaf("leaf");
+    for (int depth = 0; depth < 20; ++depth) {
+        const auto chooser = stage.Configured(InterfaceRef<Chooser>(new Chooser));
+        chooser->SetInput(0, top);
+        chooser->chosen = top;
+        top = chooser;
+    }
+    for (const std::uint32_t level : {3U, 0U}) {
+        stage.TakeLog();
+        top->EndFrame({}, stage.params, stage.results, level);
+        EXPECT_EQ(stage.log.size(), 2U) << "level " << level;
+    }
+}
+
 class Sampler final : public Concrete<MultipleTimeInputBaseNode> {
 public:
     void GetInputTimes(const RenderParams&, SampleSet& times, bool) override { times = samples; }
