@@ -5,6 +5,7 @@
 #include "Host/Software/CorrectorControls.h"
 #include "Host/Software/EffectContext.h"
 #include "Host/Software/Effects/Curves.h"
+#include "Host/Software/Effects/GaussianBlur.h"
 #include "Host/Software/Effects/Invert.h"
 #include "Host/Software/Effects/Levels.h"
 #include "Host/Software/Effects/LumaCorrector.h"
@@ -37,6 +38,8 @@ void RunLumaCorrector(const EffectContext& context, LayerPicture& layer) {
 
 EffectFunction FindEffectFunction(const std::string& matchName) {
     static const std::map<std::string, EffectFunction> kFunctions = {
+        {"TQ.XQVE Fast Blur", RunGaussianBlur},
+        {"TQ.XQVE Gaussian Blur 2", RunGaussianBlur},
         {"TQ.XQVE Invert", RunInvert},
         {"TQ.XQVE Luma Corrector", RunLumaCorrector},
         {"TQ.XQVE Luma Curve", RunLumaCurve},

@@ -16,6 +16,7 @@
 #include "Vantrel/Effects/FastColorCorrector.h"
 #include "Vantrel/Effects/Flips.h"
 #include "Vantrel/Effects/GammaCorrection.h"
+#include "Vantrel/Effects/GaussianBlur.h"
 #include "Vantrel/Effects/Intrinsics.h"
 #include "Vantrel/Effects/Invert.h"
 #include "Vantrel/Effects/Levels.h"
@@ -54,6 +55,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kProcAmpEffect,
     &kTintEffect,
     &kVerticalFlipEffect,
+    &kMotionEffect, &kOpacityEffect, &kFastBlurEffect, &kGaussianBlurEffect, &kInvertEffect, &kLumaCorrectorEffect,
 };
 
 /// The effect of that match name, or null.

@@ -10,6 +10,7 @@
 #include "Src/Filters/AdjustmentNode.h"
 #include "Src/Filters/CompositorNode.h"
 #include "Src/Filters/DisabledNode.h"
+#include "Src/Filters/Effects/GaussianBlurNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
 #include "Src/Filters/Effects/LevelsNode.h"
 #include "Src/Filters/Effects/LumaCorrectorNode.h"
@@ -59,6 +60,8 @@ constexpr RegistryEntry kEntries[] = {
     {u"MulticamRenderNode", Make<MulticamNode>},
     {u"AdjustmentNode", Make<AdjustmentNode>},
     {u"DisabledNode", Make<DisabledNode>},
+    {u"TQ.XQVE Fast Blur", Make<GaussianBlurNode>, true},
+    {u"TQ.XQVE Gaussian Blur 2", Make<GaussianBlurNode>, true},
     {u"TQ.XQVE Invert", Make<InvertNode>},
     {u"TQ.XQVE Luma Corrector", Make<LumaCorrectorNode>},
     {u"TQ.XQVE Luma Curve", Make<LumaCurveNode>},

@@ -80,12 +80,10 @@ Status CorrectorNode::BeginPass(const Shared& shared, CorrectorPass& pass, Video
         return Ostrand::kStatus_OutOfMemory;
     }
     const KernelFrame mask(maskFrame);
-    const std::int32_t maskRowBytes = Ostrand::Demand<Marl::IFrameRows>(maskFrame)->GetRowBytes();
-    const std::int32_t rowBytes = Ostrand::Demand<Marl::IFrameRows>(mFrameSlot)->GetRowBytes();
-    const Status status = RenderSecondaryMask(mDevice, frame.Data(), rowBytes, mask.Data(), maskRowBytes,
+    const Status status = RenderSecondaryMask(mDevice, frame.Data(), frame.RowBytes(), mask.Data(), mask.RowBytes(),
                                               frame.Format(), pass.mWidth, pass.mHeight, shared.selection);
     pass.mMask = mask.Data();
-    pass.mMaskPitch = maskRowBytes / static_cast<std::int32_t>(sizeof(float));
+    pass.mMaskPitch = mask.RowBytes() / static_cast<std::int32_t>(sizeof(float));
     return status;
 }
 

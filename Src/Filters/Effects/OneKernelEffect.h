@@ -34,6 +34,7 @@ public:
     [[nodiscard]] std::int32_t Width() const { return mBounds.Width(); }
     [[nodiscard]] std::int32_t Height() const { return mBounds.Height(); }
     [[nodiscard]] Vellum::PixelFormat Format() const { return mFormat; }
+    [[nodiscard]] std::int32_t RowBytes() const { return mRows->GetRowBytes(); }
     /// In pixels.
     [[nodiscard]] std::int32_t Pitch() const { return PitchInPixels(mRows->GetRowBytes(), mFormat); }
     /// A frame without memory of its own raises NullInterfaceException.
