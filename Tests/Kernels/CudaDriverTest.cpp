@@ -203,6 +203,8 @@ TEST(CudaDriver, FailuresToStartComeBackUnchanged) {
 TEST(CudaDriver, ThisMachinesDriverBindsWhole) {
     const std::string path = Kiln::GetCudaDriverPath();
     ASSERT_FALSE(path.empty()) << "the CPU driver is always there";
+    // The older request binds every name without its version, the newer one those with it.
+    ASSERT_EQ(LoadCudaDriver(0, 3010), 0);
     ASSERT_EQ(LoadCudaDriver(0, kRequested), 0);
     int version = 0;
     EXPECT_EQ(GetCudaDriver().cuDriverGetVersion(&version), CUDA_SUCCESS);
