@@ -84,20 +84,17 @@ TEST_F(NestedSequence, TheMediasOwnTimeOffsetCounts) {
 }
 
 TEST_F(NestedSequence, WithoutANodeForItThePiecesGoIntoTheMaps) {
-    refused.insert("NestedTimelineNode");
     unregistered.insert("NestedTimelineNode");
+    const std::string tree = "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))";
+    EXPECT_EQ(Describe(Build(10).tree), tree) << "a host render in its place is no node for it";
+    refused.insert("NestedTimelineNode");
     const SegmentInfo first = Build(10);
-    EXPECT_EQ(Describe(first.tree), "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))");
+    EXPECT_EQ(Describe(first.tree), tree);
     EXPECT_EQ(first.out, 300);
     EXPECT_EQ(InfoAt(300).guid, NumberedGuid(12));
     EXPECT_EQ(InfoAt(300).offset, 60);
     EXPECT_EQ(Describe(InfoAt(900).tree), "BlackVideoSource");
     EXPECT_EQ(InfoAt(900).out, 1000);
-}
-
-TEST_F(NestedSequence, AHostRenderInItsNodesPlaceIsNoNodeForIt) {
-    unregistered.insert("NestedTimelineNode");
-    EXPECT_EQ(Describe(Build(10).tree), "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))");
 }
 
 TEST_F(NestedSequence, OnlyAPlainClipOfMatchingMediaIsFlattened) {

@@ -14,7 +14,15 @@ namespace {
 using ::testing::Contains;
 using ::testing::Not;
 
-using TimelineUpdate = TimelineTester;
+class TimelineUpdate : public TimelineTester {
+protected:
+    /// Another hash, and an update, which shall succeed; what it creates is counted anew.
+    void ChangeAndUpdate() {
+        Change();
+        created.clear();
+        EXPECT_EQ(timeline->UpdateTimeline(), Ostrand::kStatus_OK);
+    }
+};
 
 constexpr std::int64_t kEnd = Vellum::kTime_Max;
 
@@ -69,14 +77,12 @@ TEST_F(TimelineUpdate, AMovedClipKeepsItsTreeAndLeavesBlackBehind) {
     AddPlainClip(11);
     AddSegment(kTop, 0, 100, 10);
     AddSegment(kTop, 100, 200, 11);
-    Timeline& read = Read();
+    Read();
     const RenderNodeRef moved = InfoAt(0).tree, still = InfoAt(100).tree;
 
     host.sequences[kTop].segments[0] = {500, 600, 0, NumberedGuid(10), 10};
     std::swap(host.sequences[kTop].segments[0], host.sequences[kTop].segments[1]);
-    Change();
-    created.clear();
-    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    ChangeAndUpdate();
     EXPECT_TRUE(created.empty());
     EXPECT_EQ(InfoAt(500).tree, moved);
     EXPECT_EQ(InfoAt(100).tree, still);
@@ -85,8 +91,7 @@ TEST_F(TimelineUpdate, AMovedClipKeepsItsTreeAndLeavesBlackBehind) {
     EXPECT_TRUE(InfoAt(0, true).guid.IsNil()) << "the statistics forget it as well";
 
     // What stood unchanged wasn't in that update's cache, and yet it lives on where it stands.
-    Change();
-    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    ChangeAndUpdate();
     EXPECT_TRUE(created.empty());
     EXPECT_EQ(InfoAt(150).tree, still);
 }
@@ -117,19 +122,17 @@ TEST_F(TimelineUpdate, MovingOneClipAmongManyBuildsNothingAndAsksForEachSegmentO
 TEST_F(TimelineUpdate, AnotherOffsetOrLengthReplacesTheRecordButNotTheTree) {
     AddPlainClip(10);
     AddSegment(kTop, 0, 100, 10);
-    Timeline& read = Read();
+    Read();
     const RenderNodeRef tree = InfoAt(0).tree;
     host.sequences[kTop].segments[0] = {0, 80, 20, NumberedGuid(10), 10};
-    Change();
-    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    ChangeAndUpdate();
     EXPECT_EQ(InfoAt(0).tree, tree);
     EXPECT_EQ(InfoAt(0).offset, 20);
     EXPECT_EQ(InfoAt(79).out, 80);
     EXPECT_EQ(Describe(InfoAt(80).tree), "BlackVideoSource");
 
     host.sequences[kTop].segments[0].offset = 30;
-    Change();
-    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    ChangeAndUpdate();
     EXPECT_EQ(InfoAt(0).tree, tree);
     EXPECT_EQ(InfoAt(0).offset, 30);
 }
@@ -247,8 +250,7 @@ TEST_F(TimelineUpdate, ReadersSeeOneUpdateOrTheNext) {
         auto& segments = host.sequences[kTop].segments;
         std::swap(segments[0].hash, segments[1].hash);
         std::swap(segments[0].node, segments[1].node);
-        Change();
-        EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+        ChangeAndUpdate();
     }
     done = true;
     reader.join();
@@ -269,13 +271,11 @@ TEST_F(TimelineUpdate, TreesWithANestedSequenceAreNeverTakenOver) {
     AddSegment(kInner, 0, 1000, 11);
     AddSegment(kTop, 0, 100, 10);
     AddSegment(kTop, 100, 200, 10, 100);
-    Timeline& read = Read();
+    Read();
     const auto count = [this](const char* key) { return std::count(created.begin(), created.end(), key); };
     EXPECT_EQ(count("NestedTimelineNode"), 2) << "once for each range";
     EXPECT_EQ(count("HostRenderClip"), 1) << "what lies within is built once";
-    Change();
-    created.clear();
-    EXPECT_EQ(read.UpdateTimeline(), Ostrand::kStatus_OK);
+    ChangeAndUpdate();
     EXPECT_EQ(count("NestedTimelineNode"), 2);
     EXPECT_EQ(count("HostRenderClip"), 0);
 }

@@ -7,8 +7,6 @@
 namespace Vantrel::Testing {
 namespace {
 
-using TreeBuilding = TimelineTester;
-
 void ExpectCounts(const SegmentInfo& info, std::int32_t effects, std::int32_t intrinsics, std::int32_t transitions,
                   std::int32_t layers) {
     EXPECT_EQ(info.effectCount, effects);
@@ -17,10 +15,14 @@ void ExpectCounts(const SegmentInfo& info, std::int32_t effects, std::int32_t in
     EXPECT_EQ(info.layerCount, layers);
 }
 
-void ExpectHostWhole(const SegmentInfo& info, const std::string& tree) {
-    EXPECT_EQ(tree, "HostRenderSource");
-    EXPECT_TRUE(info.hostWhole && info.hostPart && !info.accelerated && !info.realTime);
-}
+class TreeBuilding : public TimelineTester {
+protected:
+    /// The whole segment shall come from the host.
+    static void ExpectHostWhole(const SegmentInfo& info) {
+        EXPECT_EQ(Describe(info.tree), "HostRenderSource");
+        EXPECT_TRUE(info.hostWhole && info.hostPart && !info.accelerated && !info.realTime);
+    }
+};
 
 TEST_F(TreeBuilding, AClipsEffectsStackOnItsMediaAndAreCounted) {
     AddEffect(20, "TQ.XQVE Motion");
@@ -75,14 +77,13 @@ TEST_F(TreeBuilding, WhatCannotBeBuiltGoesWholeToTheHost) {
     AddNode(14, "Compositor", {10, 13});
     for (const std::uint32_t node : {11U, 12U, 13U, 14U}) {
         const SegmentInfo info = Build(node);
-        ExpectHostWhole(info, Describe(info.tree));
+        ExpectHostWhole(info);
         EXPECT_EQ(Probe(info.tree).description->GetNodeID(), node);
     }
     refused.insert("HostRenderClip");
-    SegmentInfo info = Build(10);
-    ExpectHostWhole(info, Describe(info.tree));
+    ExpectHostWhole(Build(10));
     refused.insert("HostRenderSource");
-    info = Build(10);
+    const SegmentInfo info = Build(10);
     EXPECT_FALSE(info.tree) << "the stretch is there, but nothing renders it";
     EXPECT_TRUE(info.hostWhole);
 }
@@ -120,10 +121,7 @@ TEST_F(TreeBuilding, WithoutACompositorOnlyABareClipIsBuilt) {
     AddNode(32, "Compositor", {11});
     AddNode(33, "Compositor", {510});
     EXPECT_EQ(Describe(Build(30).tree), "HostRenderClip");
-    for (const std::uint32_t node : {31U, 32U, 33U}) {
-        const SegmentInfo info = Build(node);
-        ExpectHostWhole(info, Describe(info.tree));
-    }
+    for (const std::uint32_t node : {31U, 32U, 33U}) ExpectHostWhole(Build(node));
 }
 
 TEST_F(TreeBuilding, TransitionsTakeTwoInputsAndResetWhenTheyNeedTheHost) {
@@ -146,8 +144,7 @@ TEST_F(TreeBuilding, TransitionsTakeTwoInputsAndResetWhenTheyNeedTheHost) {
     ExpectCounts(info, 0, 0, 0, 1);
     EXPECT_TRUE(info.hostPart);
     refused.insert("Wipe");
-    info = Build(30);
-    ExpectHostWhole(info, Describe(info.tree));
+    ExpectHostWhole(Build(30));
 }
 
 TEST_F(TreeBuilding, EffectsOverSubtreesAndDisabledNodesPassTheirInputThrough) {
@@ -155,12 +152,11 @@ TEST_F(TreeBuilding, EffectsOverSubtreesAndDisabledNodesPassTheirInputThrough) {
     AddEffect(30, "Blur");
     host.nodes[30].inputs = {{10}};
     AddNode(31, "Disabled", {30});
-    SegmentInfo info = Build(31);
+    const SegmentInfo info = Build(31);
     EXPECT_EQ(Describe(info.tree), "DisabledNode(Blur(HostRenderClip))");
     ExpectCounts(info, 1, 0, 0, 0);
     refused.insert("Blur");
-    info = Build(31);
-    ExpectHostWhole(info, Describe(info.tree));
+    ExpectHostWhole(Build(31));
 }
 
 TEST_F(TreeBuilding, InputsInheritTheTimeOffsetOfTheirNode) {
@@ -241,8 +237,7 @@ TEST_F(TreeBuilding, MulticamAnglesAreTilesAndFallBackOneByOne) {
     EXPECT_EQ(Probe(Probe(info.tree).inputs[0]).description->GetTimeOffset(), 40) << "its own offset alone";
     EXPECT_TRUE(info.hostPart);
     refused.insert("HostRenderSubtree");
-    info = Build(30);
-    ExpectHostWhole(info, Describe(info.tree));
+    ExpectHostWhole(Build(30));
 }
 
 TEST_F(TreeBuilding, AdjustmentLayersApplyTheirEffectsOrGoToTheHost) {
@@ -270,8 +265,7 @@ TEST_F(TreeBuilding, AdjustmentLayersApplyTheirEffectsOrGoToTheHost) {
     ExpectCounts(info, 0, 0, 0, 1);
     host.nodes[50].inputs.pop_back();
     host.nodes[50].inputs.pop_back();
-    info = Build(50);
-    ExpectHostWhole(info, Describe(info.tree));
+    ExpectHostWhole(Build(50));
 }
 
 TEST_F(TreeBuilding, EveryNodeIsReleasedWithItsTree) {
