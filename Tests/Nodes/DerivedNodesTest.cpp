@@ -8,7 +8,6 @@
 #include "Src/Nodes/SourceBaseNode.h"
 #include "Src/Nodes/TransformIndividualInputRenderParamsBaseNode.h"
 #include "Src/Nodes/TransformRenderParamsBaseNode.h"
-#include "Src/VideoNodes/VideoNodeFactory.h"
 #include "Tests/Nodes/ProbeNodes.h"
 #include "Tests/Support/HostedTest.h"
 
@@ -186,9 +185,7 @@ protected:
         host.nodes[1].inputs = {{2}};
         host.nodes[2].kind = "Media";
         host.nodes[2].properties = {{"MediaNode::StreamFrameRate", "1000"}, {"MediaNode::StreamFieldType", fieldType}};
-        host.sequences[9].segments = {{0, 10, 0, {1, 2, 3, {}}, 1}};
-        const VideoSegmentsHandle handle(9, SegmentsMode::kPlain, "");
-        return GetClipMedia(AcquireRootNode(handle, 0));
+        return GetClipMedia(AcquireRoot(host));
     }
     ProbeStage stage;
 };

@@ -7,7 +7,6 @@
 #include <gmock/gmock.h>
 
 #include "Src/Nodes/FinishedInputs.h"
-#include "Src/VideoNodes/VideoNodeFactory.h"
 #include "Tests/Nodes/ProbeNodes.h"
 #include "Tests/Support/HostedTest.h"
 
@@ -20,7 +19,6 @@ using ::testing::IsEmpty;
 class FilterNodeTest : public HostedTest {
 protected:
     FilterNodeTest() {
-        host.sequences[9].segments = {{0, 10, 0, {1, 2, 3, {}}, 1}};
         leaf->frame = FakeFrame::Make();
         node->SetInput(0, leaf);
         node->hash = HashOf(1);
@@ -28,8 +26,7 @@ protected:
     /// The description of a segment's root, scripted as node 1.
     VideoNodeRef Describe(const FakeNode& root) {
         host.nodes[1] = root;
-        const VideoSegmentsHandle handle(9, SegmentsMode::kPlain, "");
-        return AcquireRootNode(handle, 0);
+        return AcquireRoot(host);
     }
     FakeFrameCache& DeviceCache() { return stage.device->DeviceMemory().cache; }
 

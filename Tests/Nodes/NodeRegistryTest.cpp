@@ -6,7 +6,6 @@
 
 #include "Halden/DebugDatabase.h"
 #include "Src/Nodes/FilterNode.h"
-#include "Src/VideoNodes/VideoNodeFactory.h"
 #include "Tests/Nodes/ProbeNodes.h"
 #include "Tests/Support/HostedTest.h"
 
@@ -24,9 +23,7 @@ protected:
         host.nodes[1] = FakeNode("Clip");
         host.nodes[1].inputs = {{2}};
         host.nodes[2] = node;
-        host.sequences[9].segments = {{0, 10, 0, {1, 2, 3, {}}, 1}};
-        const VideoSegmentsHandle handle(9, SegmentsMode::kPlain, "");
-        const VideoNodeRef clip = AcquireRootNode(handle, 0);
+        const VideoNodeRef clip = AcquireRoot(host);
         return AcquireInput(9, clip->GetNodeID(), 0, 0);
     }
     FilterNodeRef Create(const WideString& key, const VideoNodeRef& description) {

@@ -4,7 +4,6 @@
 
 #include <gmock/gmock.h>
 
-#include "Src/VideoNodes/VideoNodeFactory.h"
 #include "Tests/Nodes/ProbeNodes.h"
 #include "Tests/Support/HostedTest.h"
 
@@ -139,9 +138,7 @@ protected:
         host.nodes[4].kind = "Effect";
         host.nodes[5].kind = "Effect";
         host.nodes[2].transformTime = [](std::int64_t ticks) { return ticks * 2; };
-        host.sequences[9].segments = {{0, 10, 0, {1, 2, 3, {}}, 1}};
-        const VideoSegmentsHandle handle(9, SegmentsMode::kPlain, "");
-        root = AcquireRootNode(handle, 0);
+        root = AcquireRoot(host);
         clip = AcquireInput(9, 1, 0, 0);
         stage.params.sequenceID = 9;
         stage.params.time = 500;

@@ -6,7 +6,6 @@
 
 #include "Kiln/Frames.h"
 #include "Marl/BinaryData.h"
-#include "Src/VideoNodes/VideoNodeFactory.h"
 #include "Tests/Support/DevicePictures.h"
 #include "Tests/Support/HostedTest.h"
 
@@ -25,11 +24,9 @@ protected:
 
     InterfaceRef<SolidColorNode> Matte(const FakeNode& media) {
         host.nodes[1] = media;
-        host.sequences[9].segments = {{0, 10, 0, {1, 2, 3, {}}, 1}};
-        const VideoSegmentsHandle handle(9, SegmentsMode::kPlain, "");
         InterfaceRef<SolidColorNode> node(new SolidColorNode);
         bool hostFlag = false;
-        node->Configure(AcquireRootNode(handle, 0), {{0, 0, 64, 36}, 1000, {1, 1}, 0, GetDevice()}, hostFlag);
+        node->Configure(AcquireRoot(host), {{0, 0, 64, 36}, 1000, {1, 1}, 0, GetDevice()}, hostFlag);
         return node;
     }
     static FakeNode Media(const char* instance, const Marl::BinaryData& data = {}) {

@@ -3,7 +3,6 @@
 #include <gmock/gmock.h>
 
 #include "Src/VideoNodes/VideoClipNode.h"
-#include "Src/VideoNodes/VideoNodeFactory.h"
 #include "Src/VideoNodes/VideoStructureNodes.h"
 #include "Src/VideoNodes/VideoTransitionNode.h"
 #include "Tests/Support/HostedTest.h"
@@ -23,11 +22,7 @@ protected:
         return AcquireInput(kTimeline, Parent()->GetNodeID(), 0, 100);
     }
     const VideoNodeRef& Parent() {
-        if (!mParent) {
-            host.sequences[kTimeline].segments = {{0, 10, 0, {1, 2, 3, {}}, 1}};
-            const VideoSegmentsHandle handle(kTimeline, SegmentsMode::kPlain, "");
-            mParent = AcquireRootNode(handle, 0);
-        }
+        if (!mParent) mParent = AcquireRoot(host, kTimeline);
         return mParent;
     }
 
