@@ -8,19 +8,13 @@
 
 #include "Host/Snapshot/Fingerprint.h"
 #include "Host/Suites/HostServices.h"
+#include "Tests/Host/TimelineText.h"
 
 namespace Vantrel::Host::Test {
 namespace {
 
-template <class Table>
-const Table& Acquire(const char* name, std::int32_t version) {
-    const void* suite = nullptr;
-    EXPECT_EQ(HostServices::Instance().GetBasicSuite()->AcquireSuite(name, version, &suite), 0);
-    return *static_cast<const Table*>(suite);
-}
-
 const CorvaneVideoSegmentSuite& Suite() {
-    static const auto& kSuite = Acquire<CorvaneVideoSegmentSuite>(kVideoSegmentSuiteName, kVideoSegmentSuiteVersion);
+    static const auto& kSuite = Segments();
     return kSuite;
 }
 

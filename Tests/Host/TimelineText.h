@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <gtest/gtest.h>
+
 #include <map>
 #include <nlohmann/json.hpp>
 #include <string>
@@ -159,6 +161,32 @@ struct Published : Described {
     ~Published() { HostServices::Instance().Publish(nullptr); }
     Published(const Published&) = delete;
     Published& operator=(const Published&) = delete;
+};
+
+/// A suite of the host, as the engine gets it.
+template <class Suite>
+const Suite& Acquire(const char* name, std::int32_t version) {
+    const void* suite = nullptr;
+    EXPECT_EQ(HostServices::Instance().GetBasicSuite()->AcquireSuite(std::string(name).c_str(), version, &suite), 0);
+    return *static_cast<const Suite*>(suite);
+}
+inline const CorvaneVideoSegmentSuite& Segments() {
+    return Acquire<CorvaneVideoSegmentSuite>(kVideoSegmentSuiteName, kVideoSegmentSuiteVersion);
+}
+
+/// The first segment's root in the published timeline's list, both to be released by the holder.
+struct RootHold {
+    RootHold() {
+        EXPECT_EQ(Segments().AcquireVideoSegments(1, "", &list), 0);
+        std::int64_t start = 0;
+        std::int64_t end = 0;
+        std::int64_t offset = 0;
+        EXPECT_EQ(Segments().GetSegmentInfo(list, 0, &start, &end, &offset, hash), 0);
+        EXPECT_EQ(Segments().AcquireSegmentNode(list, hash, &root), 0);
+    }
+    std::uint32_t list = 0;
+    std::uint32_t root = 0;
+    char hash[40] = {};
 };
 
 }  // namespace Vantrel::Host::Test

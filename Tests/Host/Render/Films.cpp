@@ -119,6 +119,23 @@ void WriteNumberFilm(const std::string& path, int frames, std::int64_t ticksPerF
     writer->Finish();
 }
 
+void FillPicture(Host::HostPicture& picture, const std::function<std::array<float, 4>(int x, int y)>& at) {
+    const bool floats = picture.format == Vellum::kPixelFormat_BGRA_4444_32f;
+    for (int y = 0; y < picture.height; ++y) {
+        for (int x = 0; x < picture.width; ++x) {
+            const std::array<float, 4> pixel = at(x, y);
+            for (std::size_t c = 0; c < 4; ++c) {
+                const std::size_t index = 4 * static_cast<std::size_t>(x) + c;
+                if (floats) {
+                    reinterpret_cast<float*>(picture.GetRow(y))[index] = pixel[c];
+                } else {
+                    picture.GetRow(y)[index] = static_cast<std::byte>(pixel[c] * 255.0F + 0.5F);
+                }
+            }
+        }
+    }
+}
+
 void WriteImage(const std::string& path, int width, int height,
                 const std::function<std::array<float, 4>(int x, int y)>& at) {
     Host::OutputFormat format;
@@ -129,21 +146,8 @@ void WriteImage(const std::string& path, int width, int height,
     format.alpha = true;
     const auto writer = Host::CreateFrameWriter(format, 1);
     const auto pool = PixelBufferPool::Create();
-    const bool floats = writer->GetPixelFormat() == Vellum::kPixelFormat_BGRA_4444_32f;
     const auto picture = Host::MakeHostPicture(*pool, writer->GetPixelFormat(), width, height);
-    for (int y = 0; y < height; ++y) {
-        for (int x = 0; x < width; ++x) {
-            const std::array<float, 4> pixel = at(x, y);
-            for (std::size_t c = 0; c < 4; ++c) {
-                const std::size_t index = 4 * static_cast<std::size_t>(x) + c;
-                if (floats) {
-                    reinterpret_cast<float*>(picture->GetRow(y))[index] = pixel[c];
-                } else {
-                    picture->GetRow(y)[index] = static_cast<std::byte>(pixel[c] * 255.0F + 0.5F);
-                }
-            }
-        }
-    }
+    FillPicture(*picture, at);
     writer->Write(*picture, 0);
     writer->Finish();
 }

@@ -36,6 +36,9 @@ constexpr std::int64_t kTicks2997 = 8475667200;
 void WriteNumberFilm(const std::string& path, int frames, std::int64_t ticksPerFrame = kTicks24,
                      std::uint32_t first = 0, int width = 64, int height = 64);
 
+/// Fills a picture of 8 bits or of floats by a function of the place: blue, green, red, alpha.
+void FillPicture(Host::HostPicture& picture, const std::function<std::array<float, 4>(int x, int y)>& at);
+
 /// A picture through the host's own writer, filled by a function of the place: blue, green, red, alpha.
 void WriteImage(const std::string& path, int width, int height,
                 const std::function<std::array<float, 4>(int x, int y)>& at);

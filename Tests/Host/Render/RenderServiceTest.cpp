@@ -90,8 +90,7 @@ protected:
     }
 
     [[nodiscard]] static const CorvaneVideoSegmentRenderSuite& Suite() {
-        return *static_cast<const CorvaneVideoSegmentRenderSuite*>(
-            Host::HostServices::Instance().FindSuite(kVideoSegmentRenderSuiteName, kVideoSegmentRenderSuiteVersion));
+        return Acquire<CorvaneVideoSegmentRenderSuite>(kVideoSegmentRenderSuiteName, kVideoSegmentRenderSuiteVersion);
     }
     [[nodiscard]] std::uint32_t ClipID() const {
         return mTimeline.Segments()[0].root->inputs[0].node->inputs[0].node->AsMedia()->clip->id;
@@ -105,17 +104,7 @@ protected:
     }
     /// Requests the root's picture while the format list that came with it goes out of scope.
     [[nodiscard]] VantrelHostStatus RequestRoot(Answer& answer, char* hash = nullptr) const {
-        const auto& segments = *static_cast<const CorvaneVideoSegmentSuite*>(
-            Host::HostServices::Instance().FindSuite(kVideoSegmentSuiteName, kVideoSegmentSuiteVersion));
-        std::uint32_t list = 0;
-        std::uint32_t node = 0;
-        char text[40] = {};
-        std::int64_t start = 0;
-        std::int64_t end = 0;
-        std::int64_t offset = 0;
-        EXPECT_EQ(segments.AcquireVideoSegments(1, "", &list), 0);
-        EXPECT_EQ(segments.GetSegmentInfo(list, 0, &start, &end, &offset, text), 0);
-        EXPECT_EQ(segments.AcquireSegmentNode(list, text, &node), 0);
+        const RootHold hold;
         std::uint32_t formats[] = {Vellum::FourCC("bgra"), 0};
         VantrelRenderDescription description{};
         description.pixelFormats = formats;
@@ -125,14 +114,14 @@ protected:
         description.aspectNumerator = description.aspectDenominator = 1;
         description.quality = 4;
         if (hash) {
-            EXPECT_EQ(Suite().GetNodeFrameHash(1, node, 0, 0, kFrame, 1280, 720, 1, 1, &description, hash), 0);
+            EXPECT_EQ(Suite().GetNodeFrameHash(1, hold.root, 0, 0, kFrame, 1280, 720, 1, 1, &description, hash), 0);
         }
         std::uint32_t requestID = 0;
-        const VantrelHostStatus status = Suite().RenderNode(1, node, 0, 0, kFrame, 1280, 720, 1, 1, &description,
+        const VantrelHostStatus status = Suite().RenderNode(1, hold.root, 0, 0, kFrame, 1280, 720, 1, 1, &description,
                                                             Answer::Receive, &answer, &requestID);
         formats[0] = 0xDEADBEEF;
-        segments.ReleaseNode(node);
-        segments.ReleaseVideoSegments(list);
+        Segments().ReleaseNode(hold.root);
+        Segments().ReleaseVideoSegments(hold.list);
         return status;
     }
 
@@ -237,8 +226,7 @@ TEST_F(RenderServiceTest, ASubtreeIsFoundUnderTheTextThatTheEngineMixes) {
     EXPECT_EQ(answer.calls, 1);
     EXPECT_EQ(answer.width, 320);
     EXPECT_EQ(mRenderer.formats, "a") << "the description outlives the call that brought it";
-    const auto& cache = *static_cast<const LarkspurGlazeCacheSuite*>(
-        Host::HostServices::Instance().FindSuite(kGlazeCacheSuiteName, kGlazeCacheSuiteVersion));
+    const auto& cache = Acquire<LarkspurGlazeCacheSuite>(kGlazeCacheSuiteName, kGlazeCacheSuiteVersion);
     Glaze* frame = nullptr;
     EXPECT_LT(cache.Find(hash, &frame), 0) << "the engine looks under its own text, not the host's";
     EXPECT_EQ(frame, nullptr);

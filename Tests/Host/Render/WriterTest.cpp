@@ -35,17 +35,7 @@ protected:
     std::shared_ptr<Host::HostPicture> Solid(const OutputFormat& format, Vellum::PixelFormat pixelFormat,
                                              const std::array<float, 4>& color) {
         auto picture = Host::MakeHostPicture(*mPool, pixelFormat, format.width, format.height);
-        const bool floats = pixelFormat == Vellum::kPixelFormat_BGRA_4444_32f;
-        for (int y = 0; y < format.height; ++y) {
-            for (int i = 0; i < 4 * format.width; ++i) {
-                const float value = color[static_cast<std::size_t>(i % 4)];
-                if (floats) {
-                    reinterpret_cast<float*>(picture->GetRow(y))[i] = value;
-                } else {
-                    picture->GetRow(y)[i] = static_cast<std::byte>(value * 255.0F + 0.5F);
-                }
-            }
-        }
+        FillPicture(*picture, [&](int, int) { return color; });
         return picture;
     }
 
