@@ -63,7 +63,7 @@ TEST_P(BlurEffects, AreRefusedWhereAnyKeyframeGrowsBeyondTheDevice) {
         params[kBlur_Blurriness] = blurriness;
         return dynamic_cast<GaussianBlurNode*>(MakeEffect(NameOf(false), params).Get()) != nullptr;
     };
-    FakeParam late = FakeParam().At(0, 1.0).At(1000, 1e5).At(2000, 1.0);
+    FakeParam late = FakeParam().At(0, 1.0).At(1000, 6000.0).At(2000, 1.0);
     host.nodes[kMedia].properties["MediaNode::StreamFrameWidth"] = "1920";
     host.nodes[kMedia].properties["MediaNode::StreamFrameHeight"] = "1080";
     EXPECT_TRUE(configure(FakeParam(10.0), false));

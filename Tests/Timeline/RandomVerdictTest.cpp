@@ -190,7 +190,7 @@ private:
 };
 
 TEST_F(RandomVerdicts, AgreeWithACountOfTheScript) {
-    constexpr unsigned kScripts = 1000;
+    constexpr unsigned kScripts = 64;
     int edited = 0;
     for (unsigned seed = 1; seed <= kScripts && !HasFailure(); ++seed) {
         SCOPED_TRACE("seed " + std::to_string(seed));
@@ -224,7 +224,7 @@ TEST_F(RandomVerdicts, AgreeWithACountOfTheScript) {
         }
     }
     timeline.reset();
-    EXPECT_GT(edited, 500);
+    EXPECT_GT(edited, 30);
 }
 
 }  // namespace
