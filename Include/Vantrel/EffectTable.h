@@ -55,7 +55,12 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kProcAmpEffect,
     &kTintEffect,
     &kVerticalFlipEffect,
-    &kMotionEffect, &kOpacityEffect, &kFastBlurEffect, &kGaussianBlurEffect, &kInvertEffect, &kLumaCorrectorEffect,
+    &kMotionEffect,
+    &kOpacityEffect,
+    &kFastBlurEffect,
+    &kGaussianBlurEffect,
+    &kInvertEffect,
+    &kLumaCorrectorEffect,
 };
 
 /// The effect of that match name, or null.
