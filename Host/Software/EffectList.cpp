@@ -10,6 +10,7 @@
 #include "Host/Software/Effects/Levels.h"
 #include "Host/Software/Effects/LumaCorrector.h"
 #include "Host/Software/Effects/PointwiseFilters.h"
+#include "Host/Software/Effects/UltraKey.h"
 #include "Host/Software/Effects/VideoLimiter.h"
 #include "Vantrel/Effects/Invert.h"
 
@@ -61,6 +62,7 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"TQ.XQVE ProcAmp", RunProcAmp},
         {"TQ.XQVE Tint", RunTint},
         {"KL.XQVE Vertical Flip", RunVerticalFlip},
+        {"TQ.XQVE Ultra Key", RunUltraKey},
     };
     const auto found = kFunctions.find(matchName);
     return found == kFunctions.end() ? nullptr : found->second;

@@ -166,17 +166,6 @@ EffectTable GarbageMatte(const char* matchName, std::int32_t count) {
     return table.Finish();
 }
 
-EffectTable UltraKey() {
-    Builder table("TQ.XQVE Ultra Key");
-    table.Row(0, "output", Type::kInt).Row(2, "key_color", Type::kColor, {0, 1, 0, 1});
-    table.Rows(4, Type::kDouble,
-               {{"transparency", 45}, {"highlight", 10}, {"shadow", 50}, {"tolerance", 50}, {"pedestal", 10}});
-    table.Rows(11, Type::kDouble, {{"choke", 0}, {"soften", 0}, {"contrast", 0}, {"mid_point", 50}});
-    table.Rows(17, Type::kDouble, {{"desaturate", 25}, {"range", 50}, {"spill", 50}, {"luma", 50}});
-    table.Rows(23, Type::kDouble, {{"saturation", 100}, {"hue", 0}, {"luminance", 100}});
-    return table.Finish();
-}
-
 EffectTable Timecode() {
     Builder table("TQ.XQVE Lspr Timecode");
     table.Row(0, "position", Type::kPoint, {0.5, 0.9})
@@ -248,7 +237,6 @@ std::vector<EffectTable> MakeTables() {
     AddSpatial(tables);
     tables.push_back(RgbColorCorrector());
     tables.push_back(ThreeWayColorCorrector());
-    tables.push_back(UltraKey());
     tables.push_back(Timecode());
     return tables;
 }

@@ -24,6 +24,7 @@
 #include "Vantrel/Effects/Noise.h"
 #include "Vantrel/Effects/ProcAmp.h"
 #include "Vantrel/Effects/Tint.h"
+#include "Vantrel/Effects/UltraKey.h"
 #include "Vantrel/Effects/VideoLimiter.h"
 
 /// The effects and their parameters as data, the one place where an index, a name or a default is told: nodes read by
@@ -61,6 +62,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kGaussianBlurEffect,
     &kInvertEffect,
     &kLumaCorrectorEffect,
+    &kUltraKeyEffect,
 };
 
 /// The effect of that match name, or null.

@@ -17,6 +17,7 @@
 #include "Src/Filters/Effects/LumaCurveNode.h"
 #include "Src/Filters/Effects/PointwiseFilterHostNode.h"
 #include "Src/Filters/Effects/RGBCurvesNode.h"
+#include "Src/Filters/Effects/UltraKeyNode.h"
 #include "Src/Filters/Effects/VideoLimiterNode.h"
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/IntrinsicNode.h"
@@ -83,6 +84,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE ProcAmp", Make<PointwiseFilterHostNode>},
     {u"TQ.XQVE Tint", Make<PointwiseFilterHostNode>},
     {u"KL.XQVE Vertical Flip", Make<PointwiseFilterHostNode>},
+    {u"TQ.XQVE Ultra Key", Make<UltraKeyNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

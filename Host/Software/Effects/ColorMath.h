@@ -80,4 +80,12 @@ struct ColorDifference {
     return {blue, (luma - 0.2126 * red - 0.0722 * blue) / 0.7152, red, alpha};
 }
 
+/// From display values to linear ones and back (IEC 61966-2-1), beyond 0..1 too.
+[[nodiscard]] inline double LinearLevel(double c) {
+    return c > 0.04045 ? std::pow((c + 0.055) / 1.055, 2.4) : c / 12.92;
+}
+[[nodiscard]] inline double DisplayLevel(double c) {
+    return c > 0.0031308 ? 1.055 * std::pow(c, 1.0 / 2.4) - 0.055 : c * 12.92;
+}
+
 }  // namespace Vantrel::Host::Software

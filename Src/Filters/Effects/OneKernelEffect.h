@@ -83,8 +83,17 @@ protected:
     /// place.
     template <class LaunchFunction>
     Status RenderNewFrame(EffectKernel& kernel, const LaunchFunction& launch) {
+        return RenderNewFrame([&](const KernelFrame& out, const KernelFrame& in) {
+            const std::uint64_t handle = kernel.Find(mDevice);
+            return handle == 0 ? Ostrand::kStatus_Failure : launch(handle, out, in);
+        });
+    }
+
+    /// The same for more than one kernel: runs `work(out, in)`.
+    template <class WorkFunction>
+    Status RenderNewFrame(const WorkFunction& work) {
         const VideoFrameRef input = mFrameSlot;
-        const Status status = RunOnNewFrame(kernel, launch, input);
+        const Status status = RunOnNewFrame(work, input);
         if (!Ostrand::Failed(status)) return Ostrand::kStatus_OK;
         mFrameSlot = input;
         return status;
@@ -99,14 +108,13 @@ protected:
     }
 
 private:
-    template <class LaunchFunction>
-    Status RunOnNewFrame(EffectKernel& kernel, const LaunchFunction& launch, const VideoFrameRef& input) {
+    template <class WorkFunction>
+    Status RunOnNewFrame(const WorkFunction& work, const VideoFrameRef& input) {
         const KernelFrame in(input);
         if (Ostrand::Failed(MakeFrameLike(mDevice, input, mFrameSlot))) return Ostrand::kStatus_OutOfMemory;
         const KernelFrame out(mFrameSlot);
         static_cast<void>(out.Data());
-        const std::uint64_t handle = kernel.Find(mDevice);
-        return handle == 0 ? Ostrand::kStatus_Failure : launch(handle, out, in);
+        return work(out, in);
     }
 };
 
