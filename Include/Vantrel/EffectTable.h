@@ -56,12 +56,8 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kProcAmpEffect,
     &kTintEffect,
     &kVerticalFlipEffect,
-    &kMotionEffect,
-    &kOpacityEffect,
     &kFastBlurEffect,
     &kGaussianBlurEffect,
-    &kInvertEffect,
-    &kLumaCorrectorEffect,
     &kUltraKeyEffect,
 };
 
