@@ -100,6 +100,28 @@ Ostrand::Status GaussianBlur(const DeviceRef& device, DeviceBuffer source, std::
                              Vellum::PixelFormat format, float sigmaX, float sigmaY, bool keepSize,
                              std::int32_t direction);
 
+/// Mixes two pictures of the target's size and format. With f the fraction:
+///
+///     a = f a1 + (1 - f) a2,   c = (f a1 c1 + (1 - f) a2 c2) / a
+///
+/// so that colour counts by what it covers; where nothing is covered the result is transparent black. At fraction 0.0
+/// the result is the second picture, at 1.0 the first, to the bit. The fraction isn't clamped. The target may be one of
+/// the sources.
+/// @param film mixes light rather than display values: c stands for |c|^2.2 with the sign of c, mixed and taken back.
+///             2.2 is the transfer gradient that 47 CFR 73.682 (a) (20) assumes of displays.
+Ostrand::Status CrossDissolve(const DeviceRef& device, DeviceBuffer first, std::int32_t firstRowBytes,
+                              DeviceBuffer second, std::int32_t secondRowBytes, DeviceBuffer target,
+                              std::int32_t targetRowBytes, Vellum::PixelFormat targetFormat, std::int32_t targetWidth,
+                              std::int32_t targetHeight, float fraction, bool film);
+
+/// Copies a rectangle of one buffer to a place in another of the same format. An extent of 0 or below copies nothing
+/// and is no failure; a place before a buffer's beginning or beyond its rows is one. That the rectangle ends within the
+/// last row is the caller's care, and so is that the buffers are two.
+Ostrand::Status DeviceCopyRect(const DeviceRef& device, DeviceBuffer source, std::int32_t sourceRowBytes,
+                               DeviceBuffer target, std::int32_t targetRowBytes, Vellum::PixelFormat format,
+                               std::int32_t sourceLeft, std::int32_t sourceTop, std::int32_t targetLeft,
+                               std::int32_t targetTop, std::int32_t width, std::int32_t height);
+
 /// Copies a picture with the lines of its two fields exchanged, pair by pair; an odd last line stays in its place.
 Ostrand::Status FieldReverse(const DeviceRef& device, DeviceBuffer source, std::int32_t sourceRowBytes,
                              DeviceBuffer target, std::int32_t targetRowBytes, Vellum::PixelFormat format,

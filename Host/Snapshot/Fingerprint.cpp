@@ -99,7 +99,8 @@ private:
         const TransitionDetail& transition = *node.AsTransition();
         mHasher.Text(transition.matchName).Number(time).Number(transition.duration);
         Parameters(transition.parameters, time);
-        for (const auto& [key, value] : node.properties) mHasher.Text(value);
+        // With their keys: a width of 2 isn't a direction of 2.
+        for (const auto& [key, value] : node.properties) mHasher.Text(key).Text(value);
     }
 
     /// The clip's picture is the one below, which is walked once for both.

@@ -4,6 +4,9 @@
 
 #include <cmath>
 #include <cstdio>
+#include <vector>
+
+#include "Vantrel/TransitionTable.h"
 
 namespace Vantrel::Host {
 namespace {
@@ -52,29 +55,57 @@ std::string FormatDouble(double number) {
     return text;
 }
 
+std::string PackColor(const JsonCursor& color) {
+    // Red lies in the lowest byte.
+    std::uint32_t packed = 0;
+    int shift = 0;
+    for (const double component : color.Numbers(3)) {
+        if (component < 0 || component > 255) color.Fail("a colour's components lie in 0 to 255");
+        packed |= static_cast<std::uint32_t>(component + 0.5) << shift;
+        shift += 8;
+    }
+    return std::to_string(packed);
+}
+
+std::int32_t FindChoice(const JsonCursor& at, const TransitionProperty& row) {
+    std::string accepted;
+    for (auto choice = static_cast<std::int32_t>(row.minimum); choice <= static_cast<std::int32_t>(row.maximum);
+         ++choice) {
+        const char* name = row.choiceName(choice);
+        if (name == nullptr) continue;
+        if (at.Text() == name) return choice;
+        accepted += (accepted.empty() ? "" : ", ") + std::string(name);
+    }
+    at.Fail("\"" + at.Text() + "\" isn't known; accepted are " + accepted);
+}
+
+/// The value as the engine reads it.
+std::string ReadTransitionProperty(const JsonCursor& at, const TransitionProperty& row) {
+    if (row.type == ParameterType::kColor) return PackColor(at);
+    if (row.type == ParameterType::kBool) return at.Bool() ? "1" : "0";
+    if (row.type == ParameterType::kDouble) {
+        const double number = at.Number();
+        if (number >= row.minimum && number <= row.maximum) return FormatDouble(number);
+        at.Fail("expected a number from " + FormatDouble(row.minimum) + " to " + FormatDouble(row.maximum) +
+                ", found " + at.Value().dump());
+    }
+    const bool named = row.choiceName != nullptr && at.Value().is_string();
+    return std::to_string(named ? FindChoice(at, row) : at.Integer(0, INT32_MAX));
+}
+
+/// Those of the push are all that there are; another transition that has them may be one that only a host knows.
 void ReadTransitionProperties(const JsonCursor& at, Item& item) {
     at.ExpectObject();
-    at.WarnOfOthers({"border_width", "border_color", "direction", "reverse"});
-    if (const auto color = at.Find("border_color")) {
-        // Red lies in the lowest byte.
-        std::uint32_t packed = 0;
-        int shift = 0;
-        for (const double component : color->Numbers(3)) {
-            if (component < 0 || component > 255) color->Fail("a colour's components lie in 0 to 255");
-            packed |= static_cast<std::uint32_t>(component + 0.5) << shift;
-            shift += 8;
+    std::vector<const char*> names;
+    for (const TransitionProperty& row : kPushProperties) names.push_back(row.name);
+    at.WarnOfOthers(names);
+    const TransitionRow* known = FindTransition(item.matchName.c_str());
+    if (known != nullptr && known->propertyCount == 0 && !at.Value().empty())
+        at.Warn("\"" + item.matchName + "\" has no properties");
+    for (const TransitionProperty& row : kPushProperties) {
+        if (const auto value = at.Find(row.name)) {
+            item.properties.emplace_back(row.key, ReadTransitionProperty(*value, row));
         }
-        item.properties.emplace_back("TransitionNode::TransitionBorderColor", std::to_string(packed));
-    }
-    if (const auto width = at.Find("border_width")) {
-        item.properties.emplace_back("TransitionNode::TransitionBorderWidth", FormatDouble(width->Number()));
-    }
-    if (const auto direction = at.Find("direction")) {
-        item.properties.emplace_back("TransitionNode::TransitionDirection",
-                                     std::to_string(direction->Integer(0, INT32_MAX)));
-    }
-    if (const auto reverse = at.Find("reverse")) {
-        item.properties.emplace_back("TransitionNode::TransitionReverse", reverse->Bool() ? "1" : "0");
     }
 }
 
@@ -189,10 +220,11 @@ void ReadTransition(const JsonCursor& object, Item& item) {
     if (own) {
         own->WarnOfOthers({"match_name", "params", "properties"});
         if (const auto name = own->Find("match_name")) item.matchName = name->Text();
-        if (const auto properties = own->Find("properties")) ReadTransitionProperties(*properties, item);
     }
     if (item.matchName == "SMPTE_Dissolve") item.matchName = "XQVE Cross Dissolve";
     if (item.matchName == "Custom_Transition") object.Fail("a Custom_Transition needs metadata.vantrel.match_name");
+    const auto properties = own ? own->Find("properties") : std::nullopt;
+    if (properties) ReadTransitionProperties(*properties, item);
     item.parameters = ReadParameters(item.matchName, own ? own->Find("params") : std::nullopt);
 }
 

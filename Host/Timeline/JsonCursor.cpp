@@ -143,7 +143,7 @@ void JsonCursor::ExpectArray() const {
     if (!mValue->is_array()) Fail(std::string("expected an array, found ") + KindName());
 }
 
-void JsonCursor::WarnOfOthers(std::initializer_list<const char*> keys) const {
+void JsonCursor::WarnOfOthers(const std::vector<const char*>& keys) const {
     for (const auto& member : mValue->items()) {
         const std::string& key = member.key();
         if (std::none_of(keys.begin(), keys.end(), [&](const char* known) { return key == known; })) {

@@ -60,7 +60,7 @@ public:
     void ExpectObject() const;
     void ExpectArray() const;
     /// Warns of every member that isn't among `keys`.
-    void WarnOfOthers(std::initializer_list<const char*> keys) const;
+    void WarnOfOthers(const std::vector<const char*>& keys) const;
     /// "text", "number" and so on, for messages.
     [[nodiscard]] const char* KindName() const;
 

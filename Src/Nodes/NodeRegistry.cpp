@@ -26,6 +26,9 @@
 #include "Src/Filters/NestedTimelineNode.h"
 #include "Src/Filters/SWHostRenderClipPrefetch.h"
 #include "Src/Filters/Synthetics/SolidColorNode.h"
+#include "Src/Filters/Transitions/AdditiveDissolveNode.h"
+#include "Src/Filters/Transitions/CrossDissolveNode.h"
+#include "Src/Filters/Transitions/PushNode.h"
 #include "Src/Filters/UploadNode.h"
 #include "Src/Nodes/FrameSizeLimit.h"
 #include "Src/Nodes/ProxyNode.h"
@@ -85,6 +88,12 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE Tint", Make<PointwiseFilterHostNode>},
     {u"KL.XQVE Vertical Flip", Make<PointwiseFilterHostNode>},
     {u"TQ.XQVE Ultra Key", Make<UltraKeyNode>},
+    {u"XQVE Additive Dissolve", Make<AdditiveDissolveNode>},
+    {u"XQVE Cross Dissolve", Make<CrossDissolveNode>},
+    {u"XQVE Dip To Black", Make<CrossDissolveNode>},
+    {u"XQVE Dip To White", Make<CrossDissolveNode>},
+    {u"XQVE Film Dissolve", Make<CrossDissolveNode>},
+    {u"XQVE Push", Make<PushNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

@@ -120,6 +120,8 @@ TEST_F(Command, ListsDevicesEffectsAndSegments) {
         std::find_if(effects.begin(), effects.end(), [](const Json& e) { return e["matchName"] == "TQ.XQVE Invert"; });
     ASSERT_NE(invert, effects.end());
     EXPECT_FALSE((*invert)["parameters"].empty());
+    EXPECT_EQ(effects.back()["matchName"], "XQVE Push");
+    EXPECT_EQ(effects.back()["properties"][0]["choices"], Json({"right", "down", "left", nullptr, "up"}));
     const Outcome segments = Run("segments " + WriteFilm(5));
     EXPECT_EQ(segments.status, 0);
     EXPECT_TRUE(Json::parse(segments.out).is_object());

@@ -63,12 +63,17 @@ TEST_F(FilmsAgree, OnBothFrameworksAtEveryQuality) {
     }
 }
 
-TEST_F(FilmsAgree, StructuresOnBothFrameworksAndOnTheHost) {
+TEST_F(FilmsAgree, ExamplesOnBothFrameworksAndOnTheHost) {
     const struct {
         const char* name;
         std::vector<std::int64_t> frames;
-    } examples[] = {{"adjustment", {10, 40, 70}}, {"multicam", {5, 25, 45, 65}},       {"nested", {5, 30, 60}},
-                    {"time", {3, 24, 51}},        {"interlaced", {3, 26, 49, 63, 90}}, {"titles", {80, 110}}};
+    } examples[] = {{"adjustment", {10, 40, 70}},
+                    {"multicam", {5, 25, 45, 65}},
+                    {"nested", {5, 30, 60}},
+                    {"time", {3, 24, 51}},
+                    {"interlaced", {3, 26, 49, 63, 90}},
+                    {"titles", {80, 110}},
+                    {"transitions", {3, 37, 65, 77, 118, 157, 205, 243, 278, 316, 362, 395}}};
     for (const auto& example : examples) {
         SCOPED_TRACE(example.name);
         const std::string file = std::string(VANTREL_EXAMPLES) + "/" + example.name + "/" + example.name + ".otio";

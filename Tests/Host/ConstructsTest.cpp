@@ -300,6 +300,13 @@ TEST(Fingerprints, AreEqualExactlyWhenThePicturesAre) {
     // Noise moves although nothing else does.
     const Described noise(Timeline({Track({Clip("a", 9, 10, Effects({Freeze(), Effect("TQ.XQVE Noise")}))})}));
     EXPECT_NE(printOf(noise, 0), printOf(noise, 8));
+    // The same numbers in different properties of a transition.
+    const auto push = [](const char* property) {
+        Json transition = Dissolve(4, 4);
+        transition["metadata"] = {{"vantrel", {{"match_name", "XQVE Push"}, {"properties", {{property, 2}}}}}};
+        return Timeline({Track({transition, Clip("a", 5, 10)})});
+    };
+    EXPECT_NE(printOf(Described(push("border_width")), 1), printOf(Described(push("direction")), 1));
     VantrelRenderDescription larger{};
     larger.width = 100;
     EXPECT_NE(NodeFingerprint(*clip.Segments()[0].root, 0, description),

@@ -87,6 +87,27 @@ TEST(OtioReader, ErrorsNameFilePlaceAndThing) {
     }
 }
 
+TEST(OtioReader, TransitionsAreReadByTheirTable) {
+    const auto push = [](Json properties, const char* name = "XQVE Push") {
+        Json transition = Dissolve(2, 2);
+        transition["metadata"] = {{"vantrel", {{"match_name", name}, {"properties", std::move(properties)}}}};
+        return Timeline({Track({Clip("A", 0, 10), transition, Clip("B", 0, 10)})});
+    };
+    const Document read = Read(push({{"direction", "up"}, {"border_color", {1, 2, 3}}, {"border_width", 2.5}}));
+    EXPECT_THAT(read.tracks.children.at(0).children.at(1).properties,
+                testing::UnorderedElementsAre(testing::Pair("TransitionNode::TransitionDirection", "4"),
+                                              testing::Pair("TransitionNode::TransitionBorderColor", "197121"),
+                                              testing::Pair("TransitionNode::TransitionBorderWidth", "2.5")));
+    const std::pair<Json, const char*> mistakes[] = {
+        {{{"direction", "back"}}, "direction: \"back\" isn't known; accepted are right, down, left, up"},
+        {{{"border_width", -1}}, "border_width: expected a number from 0 to 32768, found -1"},
+        {{{"border_color", {1, 2, 300}}}, "border_color: a colour's components lie in 0 to 255"},
+        {{{"reverse", "yes"}}, "reverse: expected true or false, found a text"}};
+    for (const auto& [properties, message] : mistakes) EXPECT_THAT(ErrorOf(push(properties)), HasSubstr(message));
+    EXPECT_THAT(Read(push({{"reverse", true}}, "XQVE Cross Dissolve")).warnings,
+                testing::ElementsAre(HasSubstr("\"XQVE Cross Dissolve\" has no properties")));
+}
+
 TEST(OtioReader, BrokenFilesAreToldByLineAndColumn) {
     EXPECT_THAT(ErrorOf(std::string("{\n  \"a\": [1, 2\n")),
                 HasSubstr("/films/film.otio: line 3, column 1: not valid JSON"));

@@ -53,6 +53,35 @@ TEST_P(FrameOperationsOnEachDevice, FillsARectangleAndNothingElse) {
     }
 }
 
+TEST_P(FrameOperationsOnEachDevice, ARectangleIsCopiedOrRefusedWhole) {
+    Random random;
+    SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed());
+    const Picture from = Rounded(RandomPicture(random, 40, 20));
+    const Picture before = Rounded(RandomPicture(random, 30, 25));
+    const struct {
+        int sourceLeft, sourceTop, targetLeft, targetTop, width, height;
+        bool valid = true;
+    } kCopies[] = {{0, 0, 0, 0, 30, 20},       {7, 3, 2, 5, 11, 9},        {39, 19, 29, 24, 1, 1},
+                   {0, 0, 0, 0, 0, 5},         {5, 5, 5, 5, -3, 5},        {5, 5, 5, 5, 5, -1},
+                   {-1, 0, 0, 0, 4, 4, false}, {0, -1, 0, 0, 4, 4, false}, {0, 0, -1, 0, 4, 4, false},
+                   {0, 0, 0, -1, 4, 4, false}, {40, 0, 0, 0, 4, 4, false}, {0, 0, 30, 0, 4, 4, false}};
+    for (const auto& c : kCopies) {
+        const DevicePicture source(GetDevice(), GetFormat(), from, 3);
+        const DevicePicture target(GetDevice(), GetFormat(), before, 2);
+        EXPECT_EQ(Kiln::DeviceCopyRect(GetDevice(), source.GetData(), source.GetRowBytes(), target.GetData(),
+                                       target.GetRowBytes(), GetFormat(), c.sourceLeft, c.sourceTop, c.targetLeft,
+                                       c.targetTop, c.width, c.height),
+                  c.valid ? Ostrand::kStatus_OK : Ostrand::kStatus_Failure);
+        Picture expected = before;
+        for (int y = 0; y < c.height && c.valid; ++y) {
+            for (int x = 0; x < c.width; ++x) {
+                expected.Set(c.targetLeft + x, c.targetTop + y, from.Get(c.sourceLeft + x, c.sourceTop + y));
+            }
+        }
+        EXPECT_TRUE(PicturesAgree(target.Download(), expected, kExactly)) << c.sourceLeft << ", " << c.targetLeft;
+    }
+}
+
 TEST_P(FrameOperationsOnEachDevice, ScaleMatchesTheReference) {
     Random random;
     for (int round = 0; round < 20; ++round) {

@@ -6,6 +6,7 @@
 #include <cmath>
 
 #include "Host/Software/Effects/BlendModes.h"
+#include "Host/Software/Effects/FrameRepairs.h"
 #include "Kiln/BlendMode.h"
 
 namespace Vantrel::Host::Software {
@@ -45,7 +46,16 @@ Picture CrossDissolve(const Picture& first, const Picture& second, double fracti
     });
 }
 
+Picture Dip(const Picture& side, double level, float fraction) {
+    Picture color(side.width, side.height);
+    Fill(color, 0, 0, color.width, color.height, {level, level, level, 1.0});
+    return fraction > 0.5F ? CrossDissolve(color, side, 2.0 * static_cast<double>(fraction) - 1.0, false)
+                           : CrossDissolve(side, color, 2.0 * static_cast<double>(fraction), false);
+}
+
 Picture AdditiveDissolve(const Picture& outgoing, const Picture& incoming, double fraction) {
+    if (fraction <= 0.0) return outgoing;
+    if (fraction >= 1.0) return incoming;
     const double shareA = std::min(1.0, 2.0 * (1.0 - fraction));
     const double shareB = std::min(1.0, 2.0 * fraction);
     return MixEach(outgoing, incoming, [shareA, shareB](const Pixel& a, const Pixel& b) {

@@ -14,13 +14,16 @@ namespace Vantrel::Host::Software {
 ///
 ///     a = (1 - f) a1 + f a2,   c = ((1 - f) a1 c1 + f a2 c2) / a
 ///
-/// @param film  mixes the light that values stand for, value to the power of 2.2 (negative ones mirrored), as a film
-/// that
-///              is exposed twice does
+/// @param film  mixes the light that values stand for, |c|^2.2 with the sign of c, as a film that is exposed twice does
 [[nodiscard]] Picture CrossDissolve(const Picture& first, const Picture& second, double fraction, bool film);
+
+/// A dissolve to an opaque grey of that level in the first half of the time, and from it in the second.
+/// @param side  the outgoing picture up to the middle, the incoming one after it
+[[nodiscard]] Picture Dip(const Picture& side, double level, float fraction);
 
 /// Adds: the outgoing picture stays whole up to the middle and then fades, the incoming one is whole from the middle
 /// on. With the shares p = min(1, 2 (1 - f)) and q = min(1, 2 f): a = min(1, p a1 + q a2), c = (p a1 c1 + q a2 c2) / a.
+/// At 0 and below it is the outgoing picture, at 1 and above the incoming one, to the bit.
 [[nodiscard]] Picture AdditiveDissolve(const Picture& outgoing, const Picture& incoming, double fraction);
 
 /// The sum of pictures by weights. At least one picture.
