@@ -25,6 +25,11 @@ namespace Vantrel::Host::Software {
     return t * t * (3.0 - 2.0 * t);
 }
 
+/// value^exponent, and from 0 down the value itself.
+[[nodiscard]] inline double PowerLevel(double value, double exponent) {
+    return value > 0.0 ? std::pow(value, exponent) : value;
+}
+
 struct Levels {
     double blackIn = 0.0;
     double whiteIn = 1.0;
@@ -38,7 +43,7 @@ struct Levels {
     const double span = levels.whiteIn - levels.blackIn;
     const double linear = span != 0.0 ? (v - levels.blackIn) / span : (v < levels.blackIn ? 0.0 : 1.0);
     const bool sane = levels.inverseGamma >= 0.0 && levels.inverseGamma <= 100.0;
-    const double bent = linear > 0.0 ? std::pow(linear, sane ? levels.inverseGamma : 100.0) : linear;
+    const double bent = PowerLevel(linear, sane ? levels.inverseGamma : 100.0);
     const double reach = levels.whiteOut - levels.blackOut;
     return reach != 0.0 ? levels.blackOut + bent * reach : levels.blackOut;
 }
@@ -53,11 +58,6 @@ struct TonalShares {
     const double beyondShadow = SmoothRamp(range[0], range[1], luma);
     const double highlight = SmoothRamp(range[2], range[3], luma) * beyondShadow;
     return {1.0 - beyondShadow, beyondShadow - highlight, highlight};
-}
-
-/// value^exponent, and from 0 down the value itself.
-[[nodiscard]] inline double PowerLevel(double value, double exponent) {
-    return value > 0.0 ? std::pow(value, exponent) : value;
 }
 
 /// value^(1 / gamma).

@@ -9,7 +9,10 @@ Pixel Grey(double level, double alpha) { return {level, level, level, alpha}; }
 
 Pixel Mix(const Pixel& p, const Pixel& corrected, double share) {
     Pixel mixed = p;
-    for (std::size_t c = 0; c < 3; ++c) mixed[c] += share * (corrected[c] - p[c]);
+    for (std::size_t c = 0; c < 3; ++c) {
+        const double value = share == 1.0 ? corrected[c] : p[c] + share * (corrected[c] - p[c]);
+        if (!std::isnan(value)) mixed[c] = value;
+    }
     return mixed;
 }
 
