@@ -12,6 +12,8 @@
 #include "Host/Software/Effects/PointwiseFilters.h"
 #include "Host/Software/Effects/UltraKey.h"
 #include "Host/Software/Effects/VideoLimiter.h"
+#include "Host/Software/Effects/RGBColorCorrector.h"
+#include "Host/Software/Effects/ThreeWayColorCorrector.h"
 #include "Vantrel/Effects/Invert.h"
 
 /// The one place that knows which scalar function is which effect: it reads parameters and calls.
@@ -63,6 +65,8 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"TQ.XQVE Tint", RunTint},
         {"KL.XQVE Vertical Flip", RunVerticalFlip},
         {"TQ.XQVE Ultra Key", RunUltraKey},
+        {"TQ.XQVE RGB Color Corrector", RunRGBColorCorrector},
+        {"TQ.XQVE Three-Way Color Corrector", RunThreeWayColorCorrector},
     };
     const auto found = kFunctions.find(matchName);
     return found == kFunctions.end() ? nullptr : found->second;

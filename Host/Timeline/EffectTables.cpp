@@ -13,8 +13,6 @@ namespace {
 
 using Type = ParameterType;
 
-constexpr double kFullScale = 255;
-
 /// Puts a table together; indices that nobody reads are filled so that every index up to the highest one exists.
 class Builder {
 public:
@@ -53,106 +51,6 @@ public:
 private:
     EffectTable mTable;
 };
-
-/// Limits a correction to part of the picture, chosen by colour: the same 26 parameters in five correctors.
-void AddSecondary(Builder& table, std::int32_t base) {
-    table.Rows(base, Type::kDouble,
-               {{"selection_hue_center", 0},
-                {"selection_hue_start", 50},
-                {"selection_hue_start_softness", 0},
-                {"selection_hue_end", 50},
-                {"selection_hue_end_softness", 0}});
-    table.Rows(base + 9, Type::kDouble,
-               {{"selection_saturation_start", 0},
-                {"selection_saturation_start_softness", 0},
-                {"selection_saturation_end", 100},
-                {"selection_saturation_end_softness", 0}});
-    table.Rows(base + 17, Type::kDouble,
-               {{"selection_luma_start", 0},
-                {"selection_luma_start_softness", 0},
-                {"selection_luma_end", 100},
-                {"selection_luma_end_softness", 0}});
-    table.Rows(base + 23, Type::kDouble, {{"selection_soften", 0}, {"secondary_edge_thinning", 0}});
-    table.Row(base + 25, "selection_invert", Type::kInt);
-}
-
-void AddTonalRange(Builder& table, std::int32_t base) {
-    table.Rows(
-        base, Type::kDouble,
-        {{"shadow_threshold", 64}, {"shadow_softness", 64}, {"highlight_threshold", 192}, {"highlight_softness", 192}});
-}
-
-/// Output mode and split view, as most correctors begin.
-void AddCorrectorHead(Builder& table) {
-    table.Row(0, "output", Type::kInt)
-        .Row(1, "split_view", Type::kBool)
-        .Row(2, "split_layout", Type::kInt)
-        .Row(3, "split_percent", Type::kDouble, {50});
-}
-
-constexpr const char* kTonalSets[] = {"master", "shadow", "midtone", "highlight"};
-
-void AddGammaPedestalGain(Builder& table, std::int32_t base, const std::string& prefix) {
-    table.Row(base, prefix + "_gamma", Type::kDouble, {1})
-        .Row(base + 1, prefix + "_pedestal", Type::kDouble, {0})
-        .Row(base + 2, prefix + "_gain", Type::kDouble, {1});
-}
-
-EffectTable RgbColorCorrector() {
-    Builder table("TQ.XQVE RGB Color Corrector");
-    AddCorrectorHead(table);
-    AddTonalRange(table, 6);
-    std::int32_t index = 13;
-    for (const std::string set : kTonalSets) {
-        AddGammaPedestalGain(table, index, set);
-        index += 3;
-    }
-    index = 26;
-    for (const std::string set : kTonalSets) {
-        for (const char* channel : {"_red", "_green", "_blue"}) {
-            AddGammaPedestalGain(table, index, set + channel);
-            index += 3;
-        }
-    }
-    table.Row(65, "show_mask", Type::kBool);
-    AddSecondary(table, 70);
-    return table.Finish();
-}
-
-void AddWheel(Builder& table, std::int32_t base, const std::string& prefix) {
-    table.Row(base, prefix + "_amount", Type::kDouble)
-        .Row(base + 1, prefix + "_gain", Type::kDouble)
-        .Row(base + 2, prefix + "_angle", Type::kFloat);
-}
-
-EffectTable ThreeWayColorCorrector() {
-    Builder table("TQ.XQVE Three-Way Color Corrector");
-    table.Row(0, "output", Type::kInt)
-        .Row(2, "split_view", Type::kBool)
-        .Row(3, "split_layout", Type::kInt)
-        .Row(4, "split_percent", Type::kDouble, {50})
-        .Row(18, "show_tonal_range", Type::kBool);
-    AddTonalRange(table, 19);
-    table.Rows(25, Type::kDouble,
-               {{"shadow_saturation", 100}, {"midtone_saturation", 100}, {"highlight_saturation", 100}});
-    table.Row(32, "show_mask", Type::kBool);
-    AddSecondary(table, 37);
-    std::int32_t index = 76;
-    for (const std::string set : {"shadow", "midtone", "highlight"}) {
-        table.Row(index, set + "_hue_angle", Type::kFloat);
-        AddWheel(table, index + 1, set + "_balance");
-        index += 6;
-    }
-    table.Row(94, "master_hue_angle", Type::kFloat);
-    AddWheel(table, 95, "master_balance");
-    table.Rows(100, Type::kDouble,
-               {{"input_black", 0},
-                {"input_gamma", 1},
-                {"input_white", kFullScale},
-                {"output_black", 0},
-                {"output_white", kFullScale}});
-    return table.Finish();
-}
 
 /// A polygon of `count` corners that goes round the frame's edge clockwise from the top left.
 EffectTable GarbageMatte(const char* matchName, std::int32_t count) {
@@ -235,8 +133,6 @@ std::vector<EffectTable> MakeTables() {
     std::vector<EffectTable> tables;
     for (const EffectRow* effect : kEffectTable) tables.push_back(FromEngine(*effect));
     AddSpatial(tables);
-    tables.push_back(RgbColorCorrector());
-    tables.push_back(ThreeWayColorCorrector());
     tables.push_back(Timecode());
     return tables;
 }

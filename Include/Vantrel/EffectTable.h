@@ -26,6 +26,8 @@
 #include "Vantrel/Effects/Tint.h"
 #include "Vantrel/Effects/UltraKey.h"
 #include "Vantrel/Effects/VideoLimiter.h"
+#include "Vantrel/Effects/RGBColorCorrector.h"
+#include "Vantrel/Effects/ThreeWayColorCorrector.h"
 
 /// The effects and their parameters as data, the one place where an index, a name or a default is told: nodes read by
 /// these indices, hosts read files and list effects by these rows. An effect is a header in Vantrel/Effects and a line
@@ -59,6 +61,8 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kFastBlurEffect,
     &kGaussianBlurEffect,
     &kUltraKeyEffect,
+    &kMotionEffect,        &kOpacityEffect,           &kInvertEffect,
+    &kLumaCorrectorEffect, &kRGBColorCorrectorEffect, &kThreeWayColorCorrectorEffect,
 };
 
 /// The effect of that match name, or null.

@@ -19,6 +19,8 @@
 #include "Src/Filters/Effects/RGBCurvesNode.h"
 #include "Src/Filters/Effects/UltraKeyNode.h"
 #include "Src/Filters/Effects/VideoLimiterNode.h"
+#include "Src/Filters/Effects/RGBColorCorrectorNode.h"
+#include "Src/Filters/Effects/ThreeWayColorCorrectorNode.h"
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/IntrinsicNode.h"
 #include "Src/Filters/MediaNode.h"
@@ -94,6 +96,8 @@ constexpr RegistryEntry kEntries[] = {
     {u"XQVE Dip To White", Make<CrossDissolveNode>},
     {u"XQVE Film Dissolve", Make<CrossDissolveNode>},
     {u"XQVE Push", Make<PushNode>},
+    {u"TQ.XQVE RGB Color Corrector", Make<RGBColorCorrectorNode>},
+    {u"TQ.XQVE Three-Way Color Corrector", Make<ThreeWayColorCorrectorNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

@@ -60,6 +60,37 @@ VideoFrameRef MakePaddedFrame(const Kiln::DeviceRef& device, Vellum::PixelFormat
     return VideoFrameRef(new PaddedFrame(std::move(padded), format));
 }
 
+FakeParam ToParam(const ParameterRow& row, const std::array<double, 4>& value) {
+    switch (row.type) {
+        case ParameterType::kBool:
+            return value[0] != 0.0;
+        case ParameterType::kFloat:
+            return static_cast<float>(value[0]);
+        case ParameterType::kDouble:
+            return value[0];
+        case ParameterType::kPoint:
+            return FakePoint{value[0], value[1]};
+        case ParameterType::kColor: {
+            std::array<std::uint16_t, 4> words{};  // blue, green, red, alpha
+            const std::size_t order[] = {2, 1, 0, 3};
+            for (std::size_t c = 0; c < 4; ++c) words[c] = static_cast<std::uint16_t>(value[order[c]] * 65280.0);
+            return words;
+        }
+        default:
+            return static_cast<std::int32_t>(value[0]);
+    }
+}
+
+std::map<std::int32_t, FakeParam> MakeParams(const EffectRow& effect, const std::map<std::int32_t, double>& overrides) {
+    std::map<std::int32_t, FakeParam> params;
+    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+        const ParameterRow& row = effect.parameters[i];
+        const auto found = overrides.find(row.index);
+        params[row.index] = ToParam(row, found == overrides.end() ? row.value : std::array<double, 4>{found->second});
+    }
+    return params;
+}
+
 EffectTest::EffectTest() {
     Initialize(host.GetBasicSuite());
     host.nodes[kMedia].kind = "Media";
@@ -72,18 +103,22 @@ EffectTest::EffectTest() {
 
 EffectTest::~EffectTest() { Terminate(); }
 
-RenderNodeRef EffectTest::MakeEffect(const std::string& matchName, const Params& params) {
+VideoNodeRef EffectTest::DescribeEffect(const std::string& matchName, const Params& params) {
     host.nodes[kEffect].properties["EffectNode::FilterMatchName"] = matchName;
     host.nodes[kEffect].params = params;
     const VideoSegmentsHandle handle(kSequence, SegmentsMode::kPlain, "");
-    const VideoNodeRef clip = AcquireRootNode(handle, 0);
+    return GetEffect(AcquireRootNode(handle, 0), 0);
+}
+
+RenderNodeRef EffectTest::MakeEffect(const std::string& matchName, const Params& params) {
+    const VideoNodeRef description = DescribeEffect(matchName, params);
     RenderRequirements requirements;
     requirements.frameRect = {0, 0, 64, 36};
     requirements.device = GetDevice();
     bool needsHost = false;
     const Halden::WideString key = Halden::ToWide(matchName);
     EXPECT_TRUE(isRegistered(key, GetDevice())) << matchName;
-    return createNode(key, GetDevice(), GetEffect(clip, 0), requirements, needsHost);
+    return createNode(key, GetDevice(), description, requirements, needsHost);
 }
 
 Status EffectTest::TryRenderOver(const RenderNodeRef& node, const VideoFrameRef& input, VideoFrameRef& output,

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <array>
 #include <cstdint>
 #include <map>
 #include <string>
@@ -10,6 +11,7 @@
 #include "Src/Nodes/RenderNodeBase.h"
 #include "Tests/Support/DevicePictures.h"
 #include "Tests/Support/FakeHost.h"
+#include "Vantrel/Effects/EffectRow.h"
 
 namespace Vantrel::Testing {
 
@@ -34,6 +36,12 @@ private:
 [[nodiscard]] VideoFrameRef MakePaddedFrame(const Kiln::DeviceRef& device, Vellum::PixelFormat format,
                                             const Picture& picture, int sparePixels);
 
+/// A parameter of the row's type.
+[[nodiscard]] FakeParam ToParam(const ParameterRow& row, const std::array<double, 4>& value);
+/// All parameters of an effect: at their defaults but for the numbers given.
+[[nodiscard]] std::map<std::int32_t, FakeParam> MakeParams(const EffectRow& effect,
+                                                           const std::map<std::int32_t, double>& overrides);
+
 /// Runs one effect as the engine does: made by its match name from the registry, over a frame, with the parameters of a
 /// scripted clip, on each device and in each pixel format.
 class EffectTest : public DeviceTest {
@@ -43,6 +51,8 @@ protected:
 
     using Params = std::map<std::int32_t, FakeParam>;
 
+    /// The clip's effect as the host describes it.
+    [[nodiscard]] VideoNodeRef DescribeEffect(const std::string& matchName, const Params& params);
     /// The node for an effect of the clip; empty, and the test fails, when there is none of its own.
     [[nodiscard]] RenderNodeRef MakeEffect(const std::string& matchName, const Params& params);
     /// Renders `node` over a frame at a clip time. Failures fail the test.

@@ -65,27 +65,6 @@ Values RandomValues(Random& random, const EffectRow& effect) {
     return values;
 }
 
-FakeParam ToParam(const ParameterRow& row, const std::array<double, 4>& value) {
-    switch (row.type) {
-        case ParameterType::kBool:
-            return value[0] != 0.0;
-        case ParameterType::kFloat:
-            return static_cast<float>(value[0]);
-        case ParameterType::kDouble:
-            return value[0];
-        case ParameterType::kPoint:
-            return FakePoint{value[0], value[1]};
-        case ParameterType::kColor: {
-            std::array<std::uint16_t, 4> words{};  // blue, green, red, alpha
-            const std::size_t order[] = {2, 1, 0, 3};
-            for (std::size_t c = 0; c < 4; ++c) words[c] = static_cast<std::uint16_t>(value[order[c]] * 65280.0);
-            return words;
-        }
-        default:
-            return static_cast<std::int32_t>(value[0]);
-    }
-}
-
 std::string Describe(const EffectRow& effect, const Values& values) {
     std::ostringstream text;
     text << effect.matchName;
@@ -158,6 +137,8 @@ constexpr EffectCase kCases[] = {
     // What is left of a screen's light after its removal is given eight times its strength, and then display values of
     // dark light rise by 13; steep settings of transparency and tolerance make steps of the matte.
     {"TQ.XQVE Ultra Key", 0.03, false, 20.0},
+    {"TQ.XQVE RGB Color Corrector", 0.01},
+    {"TQ.XQVE Three-Way Color Corrector", 0.01},
 };
 
 TEST_P(EveryEffect, AgreesWithItsScalarVersion) {

@@ -70,6 +70,25 @@ enum SplitLayout : std::int32_t { kSplitLayout_Rows = 0, kSplitLayout_Columns = 
              LevelParameter(first + 3, "highlight_full", 192, "level from which all is highlight")}};
 }
 
+/// Hue and colour balance are counted on the vectorscope, the plane of BT.709's colour differences
+///
+///     Cb = (B - Y) / 1.8556,  Cr = (R - Y) / 1.5748
+///
+/// where Cb points to the right (0 degrees) and Cr up (90 degrees): blue lies at -5, red at 103, green at 230 degrees.
+/// Whatever is done there leaves luma alone.
+[[nodiscard]] constexpr ParameterRow HueAngleParameter(std::int32_t index, const char* name) {
+    return {index, name, ParameterType::kFloat, "degrees", -360, 360, {0}};
+}
+
+/// A colour wheel pulls colours towards the hue of its angle, by amount times gain times sqrt(1/2); a negative amount
+/// pulls the other way.
+[[nodiscard]] constexpr std::array<ParameterRow, 3> WheelParameters(std::int32_t first,
+                                                                    const std::array<const char*, 3>& names) {
+    return {{{first, names[0], ParameterType::kDouble, "%", -100, 100, {0}},
+             {first + 1, names[1], ParameterType::kDouble, "%", 0, 100, {100}},
+             {first + 2, names[2], ParameterType::kFloat, "degrees", -360, 360, {0}}}};
+}
+
 /// The selection limits a correction to part of the picture, chosen by colour. A pixel's share is the product of three:
 ///
 /// - hue, in turns of the hexcone (Smith, "Color Gamut Transform Pairs", SIGGRAPH 1978; 0 red, 1/3 green, 2/3 blue;

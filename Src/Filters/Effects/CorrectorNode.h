@@ -54,13 +54,40 @@ private:
     std::int32_t mHeight = 0;
 };
 
+/// The four kernels of a corrector with tonal ranges, by output.
+class CorrectorKernels {
+public:
+    CorrectorKernels(const char* moduleKey, const std::array<const char*, kCorrectorOutput_Count>& names)
+        : mKernels{{{moduleKey, names[0], {}},
+                    {moduleKey, names[1], {}},
+                    {moduleKey, names[2], {}},
+                    {moduleKey, names[3], {}}}} {}
+
+    /// Queues the output's kernel. Both lists of values begin with the four levels of the tonal ranges, which are what
+    /// the view of them takes. @return kStatus_Failure for an output that there isn't.
+    template <std::size_t N, std::size_t M>
+    [[nodiscard]] Status Launch(std::int32_t output, const CorrectorPass& pass,
+                                const std::array<float, N>& compositeValues, const std::array<float, M>& lumaValues) {
+        constexpr std::size_t kTonalRange = 4;
+        const std::pair<const float*, std::size_t> values[] = {
+            {compositeValues.data(), N}, {lumaValues.data(), M}, {compositeValues.data(), kTonalRange}, {nullptr, 0}};
+        if (output < 0 || output >= kCorrectorOutput_Count) return Ostrand::kStatus_Failure;
+        const auto which = static_cast<std::size_t>(output);
+        return pass.Launch(mKernels[which], {}, values[which].first, values[which].second);
+    }
+
+private:
+    std::array<EffectKernel, kCorrectorOutput_Count> mKernels;
+};
+
 /// The base of the correctors: they work in place, with one kernel a frame that their output chooses, over the part
 /// that a split view leaves them, within a selection by colour. A corrector is its table, its kernels and this much:
 ///
 ///     Status LumaCorrectorNode::Render(...) {
 ///         return Correct(params, kLayout, [](const ParameterReader& read) {
-///             return [values](std::int32_t output, const CorrectorPass& pass) { ... pass.Launch(gComposite, values)
-///             ... };
+///             return [values](std::int32_t output, const CorrectorPass& pass) {
+///                 return gKernels.Launch(output, pass, values, values);
+///             };
 ///         });
 ///     }
 ///
