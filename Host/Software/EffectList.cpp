@@ -10,10 +10,10 @@
 #include "Host/Software/Effects/Levels.h"
 #include "Host/Software/Effects/LumaCorrector.h"
 #include "Host/Software/Effects/PointwiseFilters.h"
-#include "Host/Software/Effects/UltraKey.h"
-#include "Host/Software/Effects/VideoLimiter.h"
 #include "Host/Software/Effects/RGBColorCorrector.h"
 #include "Host/Software/Effects/ThreeWayColorCorrector.h"
+#include "Host/Software/Effects/UltraKey.h"
+#include "Host/Software/Effects/VideoLimiter.h"
 #include "Vantrel/Effects/Invert.h"
 
 /// The one place that knows which scalar function is which effect: it reads parameters and calls.

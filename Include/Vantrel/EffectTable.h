@@ -23,11 +23,11 @@
 #include "Vantrel/Effects/LumaCorrector.h"
 #include "Vantrel/Effects/Noise.h"
 #include "Vantrel/Effects/ProcAmp.h"
+#include "Vantrel/Effects/RGBColorCorrector.h"
+#include "Vantrel/Effects/ThreeWayColorCorrector.h"
 #include "Vantrel/Effects/Tint.h"
 #include "Vantrel/Effects/UltraKey.h"
 #include "Vantrel/Effects/VideoLimiter.h"
-#include "Vantrel/Effects/RGBColorCorrector.h"
-#include "Vantrel/Effects/ThreeWayColorCorrector.h"
 
 /// The effects and their parameters as data, the one place where an index, a name or a default is told: nodes read by
 /// these indices, hosts read files and list effects by these rows. An effect is a header in Vantrel/Effects and a line
@@ -61,8 +61,12 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kFastBlurEffect,
     &kGaussianBlurEffect,
     &kUltraKeyEffect,
-    &kMotionEffect,        &kOpacityEffect,           &kInvertEffect,
-    &kLumaCorrectorEffect, &kRGBColorCorrectorEffect, &kThreeWayColorCorrectorEffect,
+    &kMotionEffect,
+    &kOpacityEffect,
+    &kInvertEffect,
+    &kLumaCorrectorEffect,
+    &kRGBColorCorrectorEffect,
+    &kThreeWayColorCorrectorEffect,
 };
 
 /// The effect of that match name, or null.
