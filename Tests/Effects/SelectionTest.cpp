@@ -92,7 +92,7 @@ TEST_P(SelectionOnEachDevice, TheBlurMatchesTheScalarRecursion) {
     Random random;
     SCOPED_TRACE(random.GetSeed());
     for (const auto& [width, height] : kSizes) {
-        for (const int spare : {0, 5}) {
+        for (const int spare : {0, 8}) {  // rows of device memory come in fours, on which squares rely
             const float sigmaX = random.Uniform(0.4F, 6.0F), sigmaY = random.Uniform(0.4F, 6.0F);
             Host::Software::Mask expected{width, height, {}};
             const auto pitch = static_cast<std::size_t>(width + spare), rows = static_cast<std::size_t>(height);
