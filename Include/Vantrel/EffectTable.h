@@ -61,10 +61,6 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kFastBlurEffect,
     &kGaussianBlurEffect,
     &kUltraKeyEffect,
-    &kMotionEffect,
-    &kOpacityEffect,
-    &kInvertEffect,
-    &kLumaCorrectorEffect,
     &kRGBColorCorrectorEffect,
     &kThreeWayColorCorrectorEffect,
 };
