@@ -68,12 +68,12 @@ VideoFrameRef FilterNode::FindCachedFrame(const Guid& hash, const RenderResultsR
     const auto hashOf = [](const VideoFrameRef& frame) {
         return Ostrand::Demand<Marl::IFrameIdentity>(frame)->GetHash();
     };
-    // A frame that was rendered further in place, or placed anew, carries another fingerprint by now.
+    // A frame that was rendered further in place, or placed anew, carries another fingerprint by now, or none where the
+    // node that did so has none.
     VideoFrameRef stored = results->FindFrame(hash);
     if (stored && hashOf(stored) == hash) return stored;
     VideoFrameRef cached = mDevice->GetDeviceMemory()->GetFrameCache().FindFrame(hash);
-    const Guid cachedHash = cached ? hashOf(cached) : Guid();
-    if (!cachedHash.IsNil() && cachedHash != hash) cached.Reset();
+    if (cached && hashOf(cached) != hash) cached.Reset();
     return cached;
 }
 

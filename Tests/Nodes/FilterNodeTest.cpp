@@ -59,10 +59,17 @@ TEST_F(FilterNodeTest, AStoredFrameThatWasRenderedOnIsDropped) {
     Ostrand::Demand<Marl::IFrameIdentity>(other)->SetHash(HashOf(2));
     stage.results->StoreFrame(HashOf(1), other);
     const VideoFrameRef cached = FakeFrame::Make();
+    Ostrand::Demand<Marl::IFrameIdentity>(cached)->SetHash(HashOf(1));
     DeviceCache().CacheFrame(HashOf(1), cached);
     EXPECT_EQ(stage.Render(*node, frame), 0);
     EXPECT_EQ(frame, cached) << "the lookup goes on in the device's cache";
     EXPECT_THAT(stage.log, IsEmpty());
+
+    // A node without a fingerprint has changed the cached frame.
+    stage.results = boost::make_shared<RenderResults>();
+    Ostrand::Demand<Marl::IFrameIdentity>(cached)->SetHash({});
+    EXPECT_EQ(stage.Render(*node, frame), 0);
+    EXPECT_NE(frame, cached);
 }
 
 TEST_F(FilterNodeTest, WithoutCachingTheInputPassesThrough) {
