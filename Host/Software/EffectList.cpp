@@ -11,6 +11,7 @@
 #include "Host/Software/Effects/LumaCorrector.h"
 #include "Host/Software/Effects/PointwiseFilters.h"
 #include "Host/Software/Effects/RGBColorCorrector.h"
+#include "Host/Software/Effects/Sharpen.h"
 #include "Host/Software/Effects/ThreeWayColorCorrector.h"
 #include "Host/Software/Effects/UltraKey.h"
 #include "Host/Software/Effects/VideoLimiter.h"
@@ -65,6 +66,7 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"TQ.XQVE Tint", RunTint},
         {"KL.XQVE Vertical Flip", RunVerticalFlip},
         {"TQ.XQVE Ultra Key", RunUltraKey},
+        {"TQ.XQVE Sharpen", RunSharpen},
         {"TQ.XQVE RGB Color Corrector", RunRGBColorCorrector},
         {"TQ.XQVE Three-Way Color Corrector", RunThreeWayColorCorrector},
     };

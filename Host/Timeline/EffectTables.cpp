@@ -102,7 +102,6 @@ void AddSpatial(std::vector<EffectTable>& tables) {
         Simple("TQ.XQVE TQCrop", {P("left", Type::kFloat), P("top", Type::kFloat), P("right", Type::kFloat),
                                   P("bottom", Type::kFloat), P("zoom", Type::kBool)}));
     tables.push_back(Simple("TQ.XQVE Motion Blur", {P("direction", Type::kFloat), P("length", Type::kFloat)}));
-    tables.push_back(Simple("TQ.XQVE Sharpen", {P("amount", Type::kInt)}));
     tables.push_back(
         Simple("TQ.XQVE Legacy Key Track Matte",
                {P("matte_track", Type::kInt), P("composite_using", Type::kInt), P("reverse", Type::kBool)}));

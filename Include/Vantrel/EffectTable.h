@@ -24,6 +24,7 @@
 #include "Vantrel/Effects/Noise.h"
 #include "Vantrel/Effects/ProcAmp.h"
 #include "Vantrel/Effects/RGBColorCorrector.h"
+#include "Vantrel/Effects/Sharpen.h"
 #include "Vantrel/Effects/ThreeWayColorCorrector.h"
 #include "Vantrel/Effects/Tint.h"
 #include "Vantrel/Effects/UltraKey.h"
@@ -63,6 +64,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kUltraKeyEffect,
     &kRGBColorCorrectorEffect,
     &kThreeWayColorCorrectorEffect,
+    &kSharpenEffect,
 };
 
 /// The effect of that match name, or null.

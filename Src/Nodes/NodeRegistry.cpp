@@ -18,6 +18,7 @@
 #include "Src/Filters/Effects/PointwiseFilterHostNode.h"
 #include "Src/Filters/Effects/RGBColorCorrectorNode.h"
 #include "Src/Filters/Effects/RGBCurvesNode.h"
+#include "Src/Filters/Effects/SharpenNode.h"
 #include "Src/Filters/Effects/ThreeWayColorCorrectorNode.h"
 #include "Src/Filters/Effects/UltraKeyNode.h"
 #include "Src/Filters/Effects/VideoLimiterNode.h"
@@ -90,6 +91,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE Tint", Make<PointwiseFilterHostNode>},
     {u"KL.XQVE Vertical Flip", Make<PointwiseFilterHostNode>},
     {u"TQ.XQVE Ultra Key", Make<UltraKeyNode>},
+    {u"TQ.XQVE Sharpen", Make<SharpenNode>},
     {u"XQVE Additive Dissolve", Make<AdditiveDissolveNode>},
     {u"XQVE Cross Dissolve", Make<CrossDissolveNode>},
     {u"XQVE Dip To Black", Make<CrossDissolveNode>},

@@ -137,6 +137,8 @@ constexpr EffectCase kCases[] = {
     // What is left of a screen's light after its removal is given eight times its strength, and then display values of
     // dark light rise by 13; steep settings of transparency and tolerance make steps of the matte.
     {"TQ.XQVE Ultra Key", 0.03, false, 20.0},
+    // Up to seven times what two neighbours differ by.
+    {"TQ.XQVE Sharpen", 0.0, true, 10.0},
     {"TQ.XQVE RGB Color Corrector", 0.02, true, 30.0},
     {"TQ.XQVE Three-Way Color Corrector", 0.02, true, 30.0},
 };
