@@ -33,6 +33,8 @@ const struct {
     std::map<std::int32_t, double> settings;
 } kCases[] = {
     {"sharpen", "TQ.XQVE Sharpen", {{0, 40.0}}},
+    {"basic 3D", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, 20.0}}},
+    {"basic 3D, highlight", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, -20.0}, {2, 20.0}, {3, 1.0}}},
 };
 
 void Check(bool good) {

@@ -5,6 +5,7 @@
 #include <cstring>
 
 #include "Vantrel/Effects/AlphaAdjust.h"
+#include "Vantrel/Effects/Basic3D.h"
 #include "Vantrel/Effects/BlackAndWhite.h"
 #include "Vantrel/Effects/BrightnessContrast.h"
 #include "Vantrel/Effects/ColorBalance.h"
@@ -65,6 +66,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kRGBColorCorrectorEffect,
     &kThreeWayColorCorrectorEffect,
     &kSharpenEffect,
+    &kBasic3DEffect,
 };
 
 /// The effect of that match name, or null.

@@ -16,6 +16,12 @@ using Ostrand::Status;
 /// A frame's memory, a buffer or any other device value. Opaque: kernels take it together with offsets, never moved.
 using DeviceValue = std::uint64_t;
 
+/// Two floats in one argument of 8 bytes.
+struct float2 {
+    float x = 0.0F;
+    float y = 0.0F;
+};
+
 /// One packing pass: hands a kernel its arguments one after the other, on whichever framework. The first failure stops
 /// it. Not re-entrant for one kernel, which itself stores the arguments until it is launched.
 class KernelArgs {
@@ -53,8 +59,9 @@ template <class T>
         return static_cast<std::int32_t>(isHalf ? 0 : 1);
     } else {
         static_assert(std::is_same_v<T, std::int32_t> || std::is_same_v<T, std::uint32_t> || std::is_same_v<T, float> ||
-                          std::is_same_v<T, DeviceValue> || std::is_same_v<T, Kiln::float4>,
-                      "kernels take 32-bit numbers, float4, device values, bool and PixelFormat");
+                          std::is_same_v<T, DeviceValue> || std::is_same_v<T, float2> ||
+                          std::is_same_v<T, Kiln::float4>,
+                      "kernels take 32-bit numbers, float2, float4, device values, bool and PixelFormat");
         return value;
     }
 }

@@ -52,11 +52,18 @@ DEVICE_FUNCTION Vector4 AddHalves(Vector8 pair) { return LowHalf(pair) + HighHal
 /// Two neighbouring pixels.
 DEVICE_FUNCTION Vector8 LoadPair(const uchar* address, int format) {
     Vector8 pair;
-    if (format == 0)
+    if (format == 0) {
+#ifdef __F16C__
+        SoftCuda::HalfVector8i halves;
+        __builtin_memcpy(&halves, address, sizeof halves);
+        pair = __builtin_ia32_vcvtph2ps256(halves);
+#else
         pair = __builtin_shufflevector(SoftCuda::LoadHalf4(address), SoftCuda::LoadHalf4(address + 8), 0, 1, 2, 3, 4, 5,
                                        6, 7);
-    else
+#endif
+    } else {
         __builtin_memcpy(&pair, address, sizeof pair);
+    }
     return pair;
 }
 
