@@ -181,8 +181,6 @@ std::int64_t SegmentReader::AddSegments(const VideoSegmentsHandle& handle, std::
 }
 
 void SegmentReader::AddGap(std::int64_t from, std::int64_t to, bool top) {
-    // What an edit took away must not live on in the statistics.
-    if (top) EraseOverlap(mState.mergedMap, from, to);
     SegmentInfo gap;
     gap.in = from;
     gap.out = to;

@@ -18,8 +18,9 @@ namespace Vantrel::Testing {
 using Host::Software::Picture;
 using Host::Software::Pixel;
 
-/// Numbers that differ from run to run and can be had again: VANTREL_TEST_SEED in the environment sets the seed, and a
-/// failing test should show GetSeed in its trace.
+/// Numbers that differ from test to test and are the same in every run, so that a failure can be had again.
+/// VANTREL_TEST_SEED in the environment sets another seed, "new" one that nobody has tried; a failing test should show
+/// GetSeed in its trace.
 class Random {
 public:
     Random();
@@ -64,7 +65,7 @@ struct Tolerance {
     double relative = 0.0;
     /// Colour is compared after multiplication by alpha: a nearly transparent pixel's colour counts for nothing.
     bool weighColorByAlpha = false;
-    /// The share of the pixels that may exceed the limit.
+    /// The share of the pixels that may exceed the limit; more than none is at least one pixel.
     double exceptionShare = 0.0;
 };
 

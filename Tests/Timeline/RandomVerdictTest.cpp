@@ -10,8 +10,8 @@
 namespace Vantrel::Testing {
 namespace {
 
-/// Sequences are shorter than that even at double speed.
-constexpr std::int64_t kEnd = 100;
+/// Nothing that is written reaches further, even three nested sequences deep at double speed each.
+constexpr std::int64_t kEnd = 800;
 constexpr int kLength = 40;
 constexpr std::uint32_t kNative = 0x76323130;
 
@@ -36,7 +36,6 @@ protected:
             refused.insert("NestedTimelineNode");
         }
         mNextNode = mNextContent = 100;
-        mAwkward = mFlattens;
         for (std::uint32_t sequence = 4; sequence >= kTop; --sequence) WriteSequence(sequence);
         Change();
     }
@@ -56,10 +55,6 @@ protected:
         host.sequences[kTop].previewSegments = segments;
         Change();
     }
-
-    /// Preview files in nested sequences tell another story the first time, what runs faster reaches beyond its place,
-    /// and flattened content has no record of its own: these are counted as first read only, not after edits.
-    bool mAwkward = false;
 
 private:
     bool Chance(int percent) { return mRandom->Int(1, 100) <= percent; }
@@ -92,7 +87,6 @@ private:
         mNestable = sequence < 4 ? sequence + 1 : 0;
         if (mNestable != 0 && Chance(25)) return Clip(Media(true), !mFlattens);
         if (Chance(8)) {
-            mAwkward |= sequence != kTop;
             const std::uint32_t preview = Media(false);
             host.nodes[preview].kind = "Preview";
             return preview;
@@ -155,15 +149,9 @@ private:
         auto& properties = host.nodes[clip].properties;
         auto& ofMedia = host.nodes[media].properties;
         if (Chance(15)) properties["ClipNode::ClipSpeed"] = ofMedia["MediaNode::ClipSpeed"] = "2.0";
-        mAwkward |= ofMedia.count("MediaNode::ClipSpeed") != 0 && IsNested(ofMedia);
         if (Chance(5)) properties["ClipNode::TimeRemapping"] = "1";
         if (Chance(5)) properties["ClipNode::FrameHoldAtTime"] = "4";
         return clip;
-    }
-
-    static bool IsNested(const std::map<std::string, std::string>& properties) {
-        return properties.count("MediaNode::NestedSequenceTimelineID") != 0 ||
-               properties.count("MediaNode::SelectedMulticamTrackTimelineID") != 0;
     }
 
     std::uint32_t Media(bool nested) {
@@ -189,42 +177,40 @@ private:
     bool mFlattens = false;
 };
 
-TEST_F(RandomVerdicts, AgreeWithACountOfTheScript) {
-    constexpr unsigned kScripts = 64;
-    int edited = 0;
+TEST_F(RandomVerdicts, AgreeWithACountOfTheScriptAfterEachEdit) {
+    constexpr unsigned kScripts = 250;
+    constexpr int kEdits = 3;
     for (unsigned seed = 1; seed <= kScripts && !HasFailure(); ++seed) {
-        SCOPED_TRACE("seed " + std::to_string(seed));
         Write(seed, seed % 2 == 0);
-        Read(true, kNative);
         VerdictCount count(host, *this, {std::to_string(kNative), std::to_string(0x30313276)}, kEnd);
-        count.ReadTop(kTop);
-        SegmentInfo found;
-        for (const bool merged : {false, true}) {
-            SCOPED_TRACE(merged ? "merged" : "rendered");
-            const TickModel& model = merged ? count.merged : count.rendered;
-            model.ExpectEqual(
-                [&](std::int64_t t) { return timeline->GetSegmentInfo(t, found, merged) == 0 ? &found : nullptr; });
-        }
-        if (mAwkward) continue;
-
-        // After an edit, what was kept and taken over says the same as a timeline that is read afresh.
-        for (int edit = 0; edit < 3 && !HasFailure(); ++edit) {
-            Edit();
-            EXPECT_EQ(timeline->UpdateTimeline(), 0);
-            const std::unique_ptr<Timeline> fresh = MakeTimeline(kTop, true, kNative, nullptr);
-            for (std::int64_t t = 0; t < kEnd; ++t) {
-                for (const bool merged : {false, true}) {
-                    SegmentInfo afresh;
-                    ASSERT_EQ(timeline->GetSegmentInfo(t, found, merged), fresh->GetSegmentInfo(t, afresh, merged));
-                    TickModel::ExpectSame(afresh, found, t);
-                    EXPECT_EQ(Describe(afresh.tree), Describe(found.tree)) << "tick " << t;
-                }
+        for (int edit = 0; edit <= kEdits && !HasFailure(); ++edit) {
+            SCOPED_TRACE("seed " + std::to_string(seed) + ", edit " + std::to_string(edit));
+            if (edit == 0) {
+                Read(true, kNative);
+            } else {
+                Edit();
+                EXPECT_EQ(timeline->UpdateTimeline(), 0);
             }
-            ++edited;
+            count.ReadTop(kTop);
+            SegmentInfo found;
+            const auto find = [&](bool merged) {
+                return [&, merged](std::int64_t t) {
+                    return timeline->GetSegmentInfo(t, found, merged) == 0 ? &found : nullptr;
+                };
+            };
+            count.rendered.ExpectEqual(find(false));
+            count.merged.ExpectEqual(find(true));
+
+            // Trees that were kept and taken over are those of a timeline that is read afresh.
+            const std::unique_ptr<Timeline> fresh = MakeTimeline(kTop, true, kNative, nullptr);
+            for (std::int64_t t = 0; t < kEnd && !HasFailure(); ++t) {
+                SegmentInfo kept, afresh;
+                ASSERT_EQ(timeline->GetSegmentInfo(t, kept, false), fresh->GetSegmentInfo(t, afresh, false));
+                EXPECT_EQ(Describe(afresh.tree), Describe(kept.tree)) << "tick " << t;
+            }
         }
     }
     timeline.reset();
-    EXPECT_GT(edited, 20);
 }
 
 }  // namespace

@@ -62,6 +62,15 @@ public:
         Merge(s);
     }
 
+    /// The stretch that covers a tick, with its bounds.
+    std::optional<SegmentInfo> At(std::int64_t t) const {
+        if (!mCells[Index(t)]) return std::nullopt;
+        SegmentInfo info = mCells[Index(t)]->info;
+        info.in = Bound(t, -1);
+        info.out = Bound(t, 1) + 1;
+        return info;
+    }
+
     /// `find` gives the stretch that covers a tick, or null.
     void ExpectEqual(const std::function<const SegmentInfo*(std::int64_t)>& find) const {
         for (std::int64_t t = 0; t < mEnd; ++t) {

@@ -274,7 +274,9 @@ TEST_F(TreeBuilding, EveryNodeIsReleasedWithItsTree) {
     Build(30);
     EXPECT_EQ(host.GetReferences(30), 1);
     EXPECT_EQ(host.GetReferences(510), 1);
+    AddPlainClip(11);
     host.sequences[kTop].segments.clear();
+    AddSegment(kTop, 0, 1000, 11);
     Change();
     EXPECT_EQ(timeline->UpdateTimeline(), Ostrand::kStatus_OK);
     for (const std::uint32_t node : {30U, 10U, 510U}) EXPECT_EQ(host.GetReferences(node), 0) << node;

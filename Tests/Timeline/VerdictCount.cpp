@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "Tests/Timeline/VerdictCount.h"
 
+#include <utility>
+
 namespace Vantrel::Testing {
 namespace {
 
@@ -34,6 +36,13 @@ SegmentInfo LayerAt(const SegmentInfo& stretch) {
     return layer;
 }
 
+/// An effect is the host's, with all that lies below, as soon as anything of it is.
+void CountEffect(const std::string& matchName, SegmentInfo& r, bool host) {
+    if (host) return GoesToHost(r);
+    const bool intrinsic = matchName == "TQ.XQVE Motion" || matchName == "TQ.XQVE Opacity";
+    ++(intrinsic ? r.intrinsicCount : r.effectCount);
+}
+
 void FoldCommon(SegmentInfo& r, const SegmentInfo& layer) {
     r.hostWhole |= layer.hostWhole;
     r.hostPart |= layer.hostPart;
@@ -57,7 +66,10 @@ void FoldNested(SegmentInfo& r, const SegmentInfo& inner) {
 
 }  // namespace
 
-void VerdictCount::ReadTop(std::uint32_t sequence) { Read(mHost.sequences.at(sequence), {0, mEnd, 0}, nullptr, true); }
+void VerdictCount::ReadTop(std::uint32_t sequence) {
+    mBefore = std::exchange(mKnown, {});
+    Read(mHost.sequences.at(sequence), {0, mEnd, 0}, nullptr, true);
+}
 
 void VerdictCount::Read(const FakeSequence& sequence, const Range& range, SegmentInfo* outer, bool top) {
     const std::int64_t shift = range.in - range.offset;
@@ -66,16 +78,15 @@ void VerdictCount::Read(const FakeSequence& sequence, const Range& range, Segmen
         SegmentInfo gap;
         gap.in = reached;
         gap.out = time;
-        // Where nothing lies nothing costs, whatever was there before.
-        if (top) merged.Erase(reached, time);
         if (reached < time) Enter(gap, false, top);
         reached = std::max(reached, time);
     };
     for (const FakeSegment& segment : sequence.segments) {
+        if (reached >= range.out) return;
         const std::int64_t in = std::max(range.in, segment.start + shift);
         const std::int64_t out = std::min(range.out, segment.end + shift);
-        if (in >= out) continue;
-        blackUpTo(in);
+        blackUpTo(in);  // a gap ends where its segment starts, even if that lies beyond the range
+        if (reached >= out) continue;
         const SegmentInfo verdict = Place(segment, {in, out, segment.offset + in - segment.start - shift}, top);
         if (outer) FoldNested(*outer, verdict);
         reached = out;
@@ -84,12 +95,21 @@ void VerdictCount::Read(const FakeSequence& sequence, const Range& range, Segmen
 }
 
 SegmentInfo VerdictCount::Place(const FakeSegment& segment, const Range& range, bool top) {
+    const std::optional<SegmentInfo> standing = rendered.At(range.in);
+    if (standing && !standing->nested && standing->guid == segment.hash && standing->in == range.in &&
+        standing->out == range.out && standing->offset == range.offset) {
+        return *standing;  // and both maps stay as they are
+    }
     if (top) {
         rendered.Erase(range.in, range.out);
         merged.Erase(range.in, range.out);
     }
     SegmentInfo info;
-    const auto known = mKnown.find(segment.hash);
+    auto known = mKnown.find(segment.hash);
+    if (known == mKnown.end()) {
+        const auto before = mBefore.find(segment.hash);
+        if (before != mBefore.end()) known = mKnown.insert(*before).first;
+    }
     if (known != mKnown.end()) info = known->second;
     info.in = range.in;
     info.out = range.out;
@@ -166,22 +186,18 @@ bool VerdictCount::Clip(const FakeNode& clip, Account account) {
 
 bool VerdictCount::Operator(const std::string& matchName, Account account) const {
     if (!Make(matchName, "Effect", account.host)) return false;
-    if (account.host) {
-        GoesToHost(account.record);
-    } else {
-        const bool intrinsic = matchName == "TQ.XQVE Motion" || matchName == "TQ.XQVE Opacity";
-        ++(intrinsic ? account.record.intrinsicCount : account.record.effectCount);
-    }
+    CountEffect(matchName, account.record, account.host);
     return true;
 }
 
 bool VerdictCount::EffectOver(const FakeNode& node, Account account) {
+    // What lies below may be given to the host whole, and then nothing of the device's needs it any more.
     bool own = false;
     const std::string matchName = Get(node, "EffectNode::FilterMatchName");
     if (!Make(matchName, node.kind, own) || !Node(node.inputs.at(0).node, {account.record, own})) return false;
+    CountEffect(matchName, account.record, own);
     account.host |= own;
-    bool unused = own;
-    return Operator(matchName, {account.record, unused});
+    return true;
 }
 
 bool VerdictCount::Compositor(const FakeNode& node, Account account) {

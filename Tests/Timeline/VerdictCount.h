@@ -27,6 +27,7 @@ public:
     VerdictCount(const FakeHost& host, const CreatorScript& creator, std::set<std::string> native, std::int64_t end)
         : rendered(end), merged(end), mHost(host), mCreator(creator), mNative(std::move(native)), mEnd(end) {}
 
+    /// Counts one more update: what stands unchanged, and content that the update before built, isn't counted again.
     void ReadTop(std::uint32_t sequence);
 
     TickModel rendered;
@@ -65,7 +66,8 @@ private:
     const CreatorScript& mCreator;
     const std::set<std::string> mNative;
     const std::int64_t mEnd;
-    std::map<Guid, SegmentInfo> mKnown;  ///< content that was built
+    std::map<Guid, SegmentInfo> mKnown;   ///< content that this update built or took over
+    std::map<Guid, SegmentInfo> mBefore;  ///< that of the update before
 };
 
 }  // namespace Vantrel::Testing
