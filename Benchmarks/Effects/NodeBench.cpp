@@ -35,6 +35,8 @@ const struct {
     {"sharpen", "TQ.XQVE Sharpen", {{0, 40.0}}},
     {"basic 3D", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, 20.0}}},
     {"basic 3D, highlight", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, -20.0}, {2, 20.0}, {3, 1.0}}},
+    {"crop", "TQ.XQVE TQCrop", {{0, 10.0}, {1, 20.0}, {2, 5.0}, {3, 15.0}}},
+    {"crop, zoom", "TQ.XQVE TQCrop", {{0, 10.0}, {1, 20.0}, {2, 5.0}, {3, 15.0}, {4, 1.0}}},
 };
 
 void Check(bool good) {

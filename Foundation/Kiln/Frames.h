@@ -86,4 +86,13 @@ public:
 /// Copies pixels between device frames; sizes and formats may differ. Resamples by quality when sizes do.
 [[nodiscard]] Status CopyFrame(const VideoFrameRef& source, const VideoFrameRef& target, Vellum::RenderQuality quality);
 
+/// Copies a rectangle of a device frame onto one of another of the same format, resampled by quality when their sizes
+/// differ; each pixel of the target's rectangle is replaced, alpha included, and colour is weighed by alpha. What of
+/// the source's rectangle lies outside its frame isn't part of it; with equal sizes neither is what falls outside the
+/// target. Copies nothing, and is no failure, where nothing is left. kStatus_Failure for frames of two devices or
+/// formats.
+[[nodiscard]] Status CopyFrameRect(const VideoFrameRef& source, const Vellum::Rect& sourceRect,
+                                   const VideoFrameRef& target, const Vellum::Rect& targetRect,
+                                   Vellum::RenderQuality quality);
+
 }  // namespace Kiln

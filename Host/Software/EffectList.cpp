@@ -5,6 +5,7 @@
 #include "Host/Software/CorrectorControls.h"
 #include "Host/Software/EffectContext.h"
 #include "Host/Software/Effects/Basic3D.h"
+#include "Host/Software/Effects/Crop.h"
 #include "Host/Software/Effects/Curves.h"
 #include "Host/Software/Effects/GaussianBlur.h"
 #include "Host/Software/Effects/Invert.h"
@@ -71,6 +72,7 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"TQ.XQVE RGB Color Corrector", RunRGBColorCorrector},
         {"TQ.XQVE Three-Way Color Corrector", RunThreeWayColorCorrector},
         {"TQ.XQVE Basic 3D", RunBasic3D},
+        {"TQ.XQVE TQCrop", RunCrop},
     };
     const auto found = kFunctions.find(matchName);
     return found == kFunctions.end() ? nullptr : found->second;

@@ -41,6 +41,7 @@ struct LayerPicture {
     /// The size that the media had before any effect; 0 if there are none.
     std::int32_t mediaWidth = 0;
     std::int32_t mediaHeight = 0;
+    Vellum::PixelAspectRatio mediaAspect;
 };
 
 }  // namespace Vantrel::Host::Software

@@ -143,6 +143,7 @@ LayerPicture MediaLayers::Render(const Node& media, std::int64_t mediaTime, cons
                     (size.height - Rounded(view.sequenceHeight / view.ScaleY())) / 2};
     layer.mediaWidth = size.width;
     layer.mediaHeight = size.height;
+    layer.mediaAspect = layer.aspect;
     return layer;
 }
 

@@ -11,6 +11,7 @@
 #include "Vantrel/Effects/ColorBalance.h"
 #include "Vantrel/Effects/ColorPass.h"
 #include "Vantrel/Effects/ColorReplace.h"
+#include "Vantrel/Effects/Crop.h"
 #include "Vantrel/Effects/Curves.h"
 #include "Vantrel/Effects/EdgeFeather.h"
 #include "Vantrel/Effects/Extract.h"
@@ -67,6 +68,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kThreeWayColorCorrectorEffect,
     &kSharpenEffect,
     &kBasic3DEffect,
+    &kCropEffect,
 };
 
 /// The effect of that match name, or null.

@@ -11,6 +11,7 @@
 #include "Src/Filters/CompositorNode.h"
 #include "Src/Filters/DisabledNode.h"
 #include "Src/Filters/Effects/Basic3DNode.h"
+#include "Src/Filters/Effects/CropNode.h"
 #include "Src/Filters/Effects/GaussianBlurNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
 #include "Src/Filters/Effects/LevelsNode.h"
@@ -102,6 +103,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE RGB Color Corrector", Make<RGBColorCorrectorNode>},
     {u"TQ.XQVE Three-Way Color Corrector", Make<ThreeWayColorCorrectorNode>},
     {u"TQ.XQVE Basic 3D", Make<Basic3DNode>, true},
+    {u"TQ.XQVE TQCrop", Make<CropNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

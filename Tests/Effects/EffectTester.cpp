@@ -16,10 +16,10 @@ namespace Vantrel::Testing {
 namespace {
 
 class PaddedFrame final : public Ostrand::Counted<PaddedFrame, Marl::IVideoFrame, Marl::IFrameIdentity,
-                                                  Marl::IFrameData, Marl::IFrameRows> {
+                                                  Marl::IFrameData, Marl::IFrameRows, Kiln::IDeviceFrame> {
 public:
-    PaddedFrame(std::unique_ptr<DevicePicture> picture, Vellum::PixelFormat format)
-        : mPicture(std::move(picture)), mFormat(format) {}
+    PaddedFrame(const Kiln::DeviceRef& device, std::unique_ptr<DevicePicture> picture, Vellum::PixelFormat format)
+        : mDevice(device), mPicture(std::move(picture)), mFormat(format) {}
 
     Status QueryInterface(const Guid& iid, void** out) override {
         return Ostrand::QueryTable(this, iid, out)
@@ -27,6 +27,7 @@ public:
             .Answer<Marl::IFrameIdentity>()
             .Answer<Marl::IFrameData>()
             .Answer<Marl::IFrameRows>()
+            .Answer<Kiln::IDeviceFrame>()
             .Result();
     }
     Guid GetHash() const override { return mHash; }
@@ -44,7 +45,10 @@ public:
     std::uint64_t GetData() const override { return mPicture->GetData(); }
     std::int32_t GetRowBytes() const override { return mPicture->GetRowBytes(); }
 
+    const Kiln::DeviceRef& GetDevice() const override { return mDevice; }
+
 private:
+    Kiln::DeviceRef mDevice;
     std::unique_ptr<DevicePicture> mPicture;
     Vellum::PixelFormat mFormat;
     Guid mHash;
@@ -57,7 +61,7 @@ private:
 VideoFrameRef MakePaddedFrame(const Kiln::DeviceRef& device, Vellum::PixelFormat format, const Picture& picture,
                               int sparePixels) {
     auto padded = std::make_unique<DevicePicture>(device, format, picture, sparePixels);
-    return VideoFrameRef(new PaddedFrame(std::move(padded), format));
+    return VideoFrameRef(new PaddedFrame(device, std::move(padded), format));
 }
 
 FakeParam ToParam(const ParameterRow& row, const std::array<double, 4>& value) {
@@ -121,15 +125,24 @@ RenderNodeRef EffectTest::MakeEffect(const std::string& matchName, const Params&
     return createNode(key, GetDevice(), description, requirements, needsHost);
 }
 
-Status EffectTest::TryRenderOver(const RenderNodeRef& node, const VideoFrameRef& input, VideoFrameRef& output,
-                                 std::int64_t clipTime) {
-    node->SetInput(0, RenderNodeRef(new FrameSource(input)));
+RenderParams EffectTest::MakeRequest(const VideoFrameRef& input, std::int64_t clipTime) const {
     RenderParams params;
     params.time = params.clipTime = clipTime;
     params.outputRect = params.sequenceRect = input->GetBounds();
     params.pixelAspectRatio = input->GetPixelAspectRatio();
     params.quality = IsHalf() ? 1 : 3;
     params.sequenceID = kSequence;
+    return params;
+}
+
+Status EffectTest::TryRenderOver(const RenderNodeRef& node, const VideoFrameRef& input, VideoFrameRef& output,
+                                 std::int64_t clipTime) {
+    return TryRender(node, input, MakeRequest(input, clipTime), output);
+}
+
+Status EffectTest::TryRender(const RenderNodeRef& node, const VideoFrameRef& input, const RenderParams& params,
+                             VideoFrameRef& output) {
+    node->SetInput(0, RenderNodeRef(new FrameSource(input)));
     const auto results = boost::make_shared<RenderResults>();
     const Status status = node->RenderFrame({}, params, results, output);
     node->EndFrame({}, params, results, 0);

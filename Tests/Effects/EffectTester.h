@@ -59,6 +59,10 @@ protected:
     VideoFrameRef RenderOver(const RenderNodeRef& node, const VideoFrameRef& input, std::int64_t clipTime = 0);
     Status TryRenderOver(const RenderNodeRef& node, const VideoFrameRef& input, VideoFrameRef& output,
                          std::int64_t clipTime = 0);
+    /// A request for a picture of the frame's size, of a sequence of that size; and a render by such a request.
+    [[nodiscard]] RenderParams MakeRequest(const VideoFrameRef& input, std::int64_t clipTime = 0) const;
+    Status TryRender(const RenderNodeRef& node, const VideoFrameRef& input, const RenderParams& params,
+                     VideoFrameRef& output);
     /// The effect on a picture, as the device holds it.
     [[nodiscard]] Picture Apply(const std::string& matchName, const Params& params, const Picture& picture);
 
