@@ -18,8 +18,11 @@ constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int
                  std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t, Weight, float, float, bool, bool>
     kColumns{R"(..\..\Kiln\Modules\Blur)", "BlurColumnsKernel"};
 constexpr Kernel<DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, DeviceBuffer, std::int32_t, std::int32_t,
-                 std::int32_t, std::int32_t, std::int32_t, Weight, float, float, bool>
+                 std::int32_t, std::int32_t, float, float, bool>
     kRows{R"(..\..\Kiln\Modules\Blur)", "BlurRowsKernel"};
+constexpr Kernel<DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, PixelFormat, DeviceBuffer, std::int32_t,
+                 std::int32_t, std::int32_t, std::int32_t, bool, bool>
+    kReduceRows{R"(..\..\Kiln\Modules\Blur)", "BlurReduceRowsKernel"};
 constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, PixelFormat, DeviceBuffer,
                  std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t>
     kFinish{R"(..\..\Kiln\Modules\Blur)", "BlurFinishKernel"};
@@ -119,10 +122,18 @@ Status RunAcross(const DeviceRef& device, const Pass& pass, bool clamped, WorkPi
     WorkPicture result;
     const Status status = MakeWorkPicture(device, pass.size, picture.height, result);
     if (Ostrand::Failed(status)) return status;
-    const Status launched =
-        kRows.Launch(device, ShapeFor(4 * pass.size, picture.height), result.data, result.pitch, pass.size,
-                     picture.height, picture.data, picture.pitch, picture.width, pass.step, pass.first, pass.reach,
-                     pass.weight, pass.inverseWidth, pass.scale, clamped);
+    Status launched;
+    if (pass.weight == Weight::kSpline) {
+        constexpr std::int32_t kPointsOfAThread = 16;  // BLUR_POINTS of the kernel
+        const std::int32_t threads = (pass.size + kPointsOfAThread - 1) / kPointsOfAThread;
+        launched = kReduceRows.Launch(device, ShapeFor(picture.height, threads), result.data, result.pitch, pass.size,
+                                      picture.height, picture.format, picture.data, picture.pitch, picture.width,
+                                      pass.step, pass.first, clamped, picture.straight);
+    } else {
+        launched = kRows.Launch(device, ShapeFor(4 * pass.size, picture.height), result.data, result.pitch, pass.size,
+                                picture.height, picture.data, picture.pitch, picture.width, pass.first, pass.reach,
+                                pass.inverseWidth, pass.scale, clamped);
+    }
     picture = std::move(result);
     return launched;
 }
@@ -148,7 +159,9 @@ Status GaussianBlur(const DeviceRef& device, DeviceBuffer source, std::int32_t s
     picture.format = format;
     picture.straight = true;
     Status status = Ostrand::kStatus_OK;
-    for (std::int32_t i = 0; i < y.passCount && !Ostrand::Failed(status); ++i) {
+    // The first pass onto a coarse grid takes straight pictures as they are.
+    const bool downIsPlain = !blursY && sourceHeight == targetHeight && x.passCount == 2;
+    for (std::int32_t i = 0; i < y.passCount && !downIsPlain && !Ostrand::Failed(status); ++i) {
         status = RunDown(device, y.passes[i], keepSize, picture);
     }
     const bool acrossIsPlain = !blursX && sourceWidth == targetWidth;
