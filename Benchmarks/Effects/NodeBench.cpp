@@ -37,6 +37,11 @@ const struct {
     {"basic 3D, highlight", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, -20.0}, {2, 20.0}, {3, 1.0}}},
     {"crop", "TQ.XQVE TQCrop", {{0, 10.0}, {1, 20.0}, {2, 5.0}, {3, 15.0}}},
     {"crop, zoom", "TQ.XQVE TQCrop", {{0, 10.0}, {1, 20.0}, {2, 5.0}, {3, 15.0}, {4, 1.0}}},
+    {"directional blur, upright", "TQ.XQVE Motion Blur", {{0, 0.0}, {1, 30.0}}},
+    {"directional blur, 30 degrees", "TQ.XQVE Motion Blur", {{0, 30.0}, {1, 30.0}}},
+    {"directional blur, 45 degrees", "TQ.XQVE Motion Blur", {{0, 45.0}, {1, 30.0}}},
+    {"directional blur, 50 degrees", "TQ.XQVE Motion Blur", {{0, 50.0}, {1, 30.0}}},
+    {"directional blur, level", "TQ.XQVE Motion Blur", {{0, 90.0}, {1, 30.0}}},
 };
 
 void Check(bool good) {

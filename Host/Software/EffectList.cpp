@@ -7,6 +7,7 @@
 #include "Host/Software/Effects/Basic3D.h"
 #include "Host/Software/Effects/Crop.h"
 #include "Host/Software/Effects/Curves.h"
+#include "Host/Software/Effects/DirectionalBlur.h"
 #include "Host/Software/Effects/GaussianBlur.h"
 #include "Host/Software/Effects/Invert.h"
 #include "Host/Software/Effects/Levels.h"
@@ -69,6 +70,7 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"KL.XQVE Vertical Flip", RunVerticalFlip},
         {"TQ.XQVE Ultra Key", RunUltraKey},
         {"TQ.XQVE Sharpen", RunSharpen},
+        {"TQ.XQVE Motion Blur", RunDirectionalBlur},
         {"TQ.XQVE RGB Color Corrector", RunRGBColorCorrector},
         {"TQ.XQVE Three-Way Color Corrector", RunThreeWayColorCorrector},
         {"TQ.XQVE Basic 3D", RunBasic3D},

@@ -13,6 +13,7 @@
 #include "Vantrel/Effects/ColorReplace.h"
 #include "Vantrel/Effects/Crop.h"
 #include "Vantrel/Effects/Curves.h"
+#include "Vantrel/Effects/DirectionalBlur.h"
 #include "Vantrel/Effects/EdgeFeather.h"
 #include "Vantrel/Effects/Extract.h"
 #include "Vantrel/Effects/FastColorCorrector.h"
@@ -69,6 +70,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kSharpenEffect,
     &kBasic3DEffect,
     &kCropEffect,
+    &kDirectionalBlurEffect,
 };
 
 /// The effect of that match name, or null.

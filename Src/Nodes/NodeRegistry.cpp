@@ -12,6 +12,7 @@
 #include "Src/Filters/DisabledNode.h"
 #include "Src/Filters/Effects/Basic3DNode.h"
 #include "Src/Filters/Effects/CropNode.h"
+#include "Src/Filters/Effects/DirectionalBlurNode.h"
 #include "Src/Filters/Effects/GaussianBlurNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
 #include "Src/Filters/Effects/LevelsNode.h"
@@ -94,6 +95,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"KL.XQVE Vertical Flip", Make<PointwiseFilterHostNode>},
     {u"TQ.XQVE Ultra Key", Make<UltraKeyNode>},
     {u"TQ.XQVE Sharpen", Make<SharpenNode>},
+    {u"TQ.XQVE Motion Blur", Make<DirectionalBlurNode>, true},
     {u"XQVE Additive Dissolve", Make<AdditiveDissolveNode>},
     {u"XQVE Cross Dissolve", Make<CrossDissolveNode>},
     {u"XQVE Dip To Black", Make<CrossDissolveNode>},

@@ -6,9 +6,8 @@
 
 #include "Kiln/FrameOperations.h"
 #include "Kiln/Frames.h"
+#include "Src/Filters/Effects/GrownFrame.h"
 #include "Src/Filters/Effects/OneKernelEffect.h"
-#include "Src/VideoNodes/VideoMediaNode.h"
-#include "Src/VideoNodes/VideoNodeFactory.h"
 #include "Vantrel/Effects/GaussianBlur.h"
 
 namespace Vantrel {
@@ -76,32 +75,13 @@ Blur ReadBlur(const VideoNode& effect, const WideString& name, std::int64_t time
 Status GaussianBlurNode::Configure(const VideoNodeRef& description, const RenderRequirements& requirements,
                                    bool& host) {
     if (Ostrand::Failed(FilterNode::Configure(description, requirements, host))) return Ostrand::kStatus_Failure;
-    Vellum::Rect rect = requirements.frameRect;
-    if (const VideoMediaNodeRef media = GetClipMedia(description->GetParent())) {
-        rect = media->GetStreamFrameRect();
-    }
-    const std::uint64_t memoryLimit = mDevice->GetMemoryLimit();
-    for (std::int64_t time = 0;;) {
-        if (!FitsAt(time, rect, memoryLimit)) return Ostrand::kStatus_Failure;
-        std::int64_t next = 0;
-        std::int32_t keyframe = 0;
-        const Status status = description->GetNextKeyframeTime(kBlur_Blurriness, time, next, keyframe);
-        // A host that gives the same key again has no later one.
-        if (Ostrand::Failed(status) || next <= time) return Ostrand::kStatus_OK;
-        time = next;
-    }
-}
-
-bool GaussianBlurNode::FitsAt(std::int64_t time, const Vellum::Rect& rect, std::uint64_t memoryLimit) {
-    constexpr std::uint32_t kLargestPixelBits = 4;
-    constexpr std::int64_t kFramesOfANode = 4;
-    const Blur blur = ReadBlur(*mDescription, GetName(), time);
-    const float sigma = blur.Sigma(1.0F);
-    const std::int32_t width = rect.Width() + 2 * blur.Pad(sigma, Kiln::kBlur_Horizontal);
-    const std::int32_t height = rect.Height() + 2 * blur.Pad(sigma, Kiln::kBlur_Vertical);
-    const auto bytes = static_cast<std::int32_t>(static_cast<std::uint32_t>(height) * static_cast<std::uint32_t>(width)
-                                                 << kLargestPixelBits);
-    return static_cast<std::uint64_t>(bytes * kFramesOfANode) <= memoryLimit;
+    const auto pad = [this](std::int64_t time) -> Vellum::Point {
+        const Blur blur = ReadBlur(*mDescription, GetName(), time);
+        const float sigma = blur.Sigma(1.0F);
+        return {blur.Pad(sigma, Kiln::kBlur_Horizontal), blur.Pad(sigma, Kiln::kBlur_Vertical)};
+    };
+    return FitsAtEveryKeyframe(*description, requirements, kBlur_Blurriness, pad) ? Ostrand::kStatus_OK
+                                                                                  : Ostrand::kStatus_Failure;
 }
 
 Status GaussianBlurNode::Render(const RenderToken& /*token*/, const RenderParams& params,

@@ -18,9 +18,6 @@ public:
 
 protected:
     [[nodiscard]] std::atomic<std::int32_t>& GetRef() override { return mRefCount; }
-
-private:
-    [[nodiscard]] bool FitsAt(std::int64_t time, const Vellum::Rect& rect, std::uint64_t memoryLimit);
 };
 
 }  // namespace Vantrel
