@@ -8,6 +8,7 @@
 #include "Host/Software/Effects/Crop.h"
 #include "Host/Software/Effects/Curves.h"
 #include "Host/Software/Effects/DirectionalBlur.h"
+#include "Host/Software/Effects/DropShadow.h"
 #include "Host/Software/Effects/GaussianBlur.h"
 #include "Host/Software/Effects/Invert.h"
 #include "Host/Software/Effects/Levels.h"
@@ -71,6 +72,7 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"TQ.XQVE Ultra Key", RunUltraKey},
         {"TQ.XQVE Sharpen", RunSharpen},
         {"TQ.XQVE Motion Blur", RunDirectionalBlur},
+        {"TQ.XQVE Drop Shadow", RunDropShadow},
         {"TQ.XQVE RGB Color Corrector", RunRGBColorCorrector},
         {"TQ.XQVE Three-Way Color Corrector", RunThreeWayColorCorrector},
         {"TQ.XQVE Basic 3D", RunBasic3D},

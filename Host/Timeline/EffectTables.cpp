@@ -93,9 +93,6 @@ Parameter P(const char* name, Type type, ParameterValue value = {}) {
 }
 
 void AddSpatial(std::vector<EffectTable>& tables) {
-    tables.push_back(Simple("TQ.XQVE Drop Shadow", {P("color", Type::kColor, {0, 0, 0, 1}), P("opacity", Type::kFloat),
-                                                    P("direction", Type::kFloat, {135}), P("distance", Type::kFloat),
-                                                    P("softness", Type::kFloat), P("shadow_only", Type::kBool)}));
     tables.push_back(
         Simple("TQ.XQVE Legacy Key Track Matte",
                {P("matte_track", Type::kInt), P("composite_using", Type::kInt), P("reverse", Type::kBool)}));

@@ -14,6 +14,7 @@
 #include "Vantrel/Effects/Crop.h"
 #include "Vantrel/Effects/Curves.h"
 #include "Vantrel/Effects/DirectionalBlur.h"
+#include "Vantrel/Effects/DropShadow.h"
 #include "Vantrel/Effects/EdgeFeather.h"
 #include "Vantrel/Effects/Extract.h"
 #include "Vantrel/Effects/FastColorCorrector.h"
@@ -71,6 +72,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kBasic3DEffect,
     &kCropEffect,
     &kDirectionalBlurEffect,
+    &kDropShadowEffect,
 };
 
 /// The effect of that match name, or null.

@@ -13,6 +13,7 @@
 #include "Src/Filters/Effects/Basic3DNode.h"
 #include "Src/Filters/Effects/CropNode.h"
 #include "Src/Filters/Effects/DirectionalBlurNode.h"
+#include "Src/Filters/Effects/DropShadowNode.h"
 #include "Src/Filters/Effects/GaussianBlurNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
 #include "Src/Filters/Effects/LevelsNode.h"
@@ -96,6 +97,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE Ultra Key", Make<UltraKeyNode>},
     {u"TQ.XQVE Sharpen", Make<SharpenNode>},
     {u"TQ.XQVE Motion Blur", Make<DirectionalBlurNode>, true},
+    {u"TQ.XQVE Drop Shadow", Make<DropShadowNode>},
     {u"XQVE Additive Dissolve", Make<AdditiveDissolveNode>},
     {u"XQVE Cross Dissolve", Make<CrossDissolveNode>},
     {u"XQVE Dip To Black", Make<CrossDissolveNode>},
