@@ -8,6 +8,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <map>
+#include <string>
 
 #include <boost/make_shared.hpp>
 
@@ -34,6 +35,8 @@ const struct {
 } kCases[] = {
     {"sharpen", "TQ.XQVE Sharpen", {{0, 40.0}}},
     {"basic 3D", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, 20.0}}},
+    {"stabilizer, cropped and scaled", "TQ.XQVE SubspaceStabilizer", {}},
+    {"stabilizer, whole", "TQ.XQVE SubspaceStabilizer", {{8, 0.0}}},
     {"basic 3D, highlight", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, -20.0}, {2, 20.0}, {3, 1.0}}},
     {"crop", "TQ.XQVE TQCrop", {{0, 10.0}, {1, 20.0}, {2, 5.0}, {3, 15.0}}},
     {"crop, zoom", "TQ.XQVE TQCrop", {{0, 10.0}, {1, 20.0}, {2, 5.0}, {3, 15.0}, {4, 1.0}}},
@@ -62,6 +65,10 @@ public:
         mHost.nodes[kClip].inputs = {{kMedia}};
         mHost.nodes[kClip].operators = {kEffect};
         mHost.nodes[kEffect] = {"Effect"};
+        // What the stabilizer wants: a track of a frame that is moved and turned, and frames to count.
+        mHost.opaqueData[kInstance] = mTrack.data();
+        mHost.nodes[kEffect].properties["EffectNode::RuntimeInstanceID"] = std::to_string(kInstance);
+        mHost.nodes[kMedia].properties["MediaNode::StreamFrameRate"] = std::to_string(kFrameTicks);
         mHost.sequences[kSequence].segments = {{0, Vellum::kTime_Max, 0, Testing::Guid(1, 0, 0, {}), kClip}};
         Check(!Ostrand::Failed(Kiln::CreateGPUVideoFrame(mFrame, mDevice, mFormat, kWidth, kHeight, {1, 1}, 0, {})));
     }
@@ -85,6 +92,7 @@ public:
         params.outputRect = params.sequenceRect = {0, 0, kWidth, kHeight};
         params.pixelAspectRatio = {1, 1};
         params.sequenceID = kSequence;
+        params.sequenceFrameTicks = kFrameTicks;
         const auto results = boost::make_shared<RenderResults>();
         VideoFrameRef output;
         Check(!Ostrand::Failed(node->RenderFrame({}, params, results, output)));
@@ -115,6 +123,9 @@ public:
 
 private:
     static constexpr std::uint32_t kSequence = 1, kClip = 1, kMedia = 2, kEffect = 3;
+    static constexpr std::int32_t kInstance = 1;
+    static constexpr std::int64_t kFrameTicks = 10160640000;
+    std::string mTrack = "motion-track 1 frame 1920 1080 first 0 smooth 0 cell 56 motion  24 -16 1.5 1  -24 16 -1.5 1";
     Testing::FakeHost& mHost;
     Kiln::DeviceRef mDevice;
     Vellum::PixelFormat mFormat;

@@ -101,16 +101,17 @@ void OpaqueDataTable::SetSnapshot(const Snapshot& snapshot) {
 const std::uint8_t* OpaqueDataTable::Acquire(std::uint32_t instanceID) {
     const std::lock_guard<std::mutex> lock(mMutex);
     Hold& hold = mHolds[instanceID];
-    if (!hold.effect) {
+    if (hold.bytes.empty()) {
         const auto effect = mEffects.find(instanceID);
         if (effect == mEffects.end()) {
             mHolds.erase(instanceID);
             return nullptr;
         }
-        hold.effect = effect->second;
+        hold.bytes = effect->second->AsEffect()->opaqueData;
+        hold.bytes.push_back(0);
     }
     ++hold.count;
-    return hold.effect->AsEffect()->opaqueData.data();
+    return hold.bytes.data();
 }
 
 bool OpaqueDataTable::Release(std::uint32_t instanceID) {

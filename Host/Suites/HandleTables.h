@@ -69,14 +69,15 @@ private:
 class OpaqueDataTable {
 public:
     void SetSnapshot(const Snapshot& snapshot);
-    /// Null for an instance without data. Valid until the matching release.
+    /// The data and a zero byte behind them, since nobody is told how many there are. Null for an instance without
+    /// data. Valid until the matching release.
     [[nodiscard]] const std::uint8_t* Acquire(std::uint32_t instanceID);
     /// @return whether that was the last hold; false also for an instance that isn't held
     bool Release(std::uint32_t instanceID);
 
 private:
     struct Hold {
-        NodePtr effect;
+        std::vector<std::uint8_t> bytes;
         std::uint32_t count = 0;
     };
 

@@ -99,12 +99,6 @@ void AddSpatial(std::vector<EffectTable>& tables) {
     tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte", 4));
     tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte 8", 8));
     tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte 16", 16));
-    Builder stabilizer("TQ.XQVE SubspaceStabilizer");
-    stabilizer.Row(8, "framing", Type::kInt)
-        .Rows(10, Type::kDouble, {{"largest_scale", 100}, {"margin", 0}})
-        .Row(13, "extra_scale", Type::kDouble, {100})
-        .DependsOnTime();
-    tables.push_back(stabilizer.Finish());
 }
 
 /// An effect that the engine lists itself.

@@ -29,6 +29,7 @@
 #include "Vantrel/Effects/ProcAmp.h"
 #include "Vantrel/Effects/RGBColorCorrector.h"
 #include "Vantrel/Effects/Sharpen.h"
+#include "Vantrel/Effects/Stabilizer.h"
 #include "Vantrel/Effects/ThreeWayColorCorrector.h"
 #include "Vantrel/Effects/Tint.h"
 #include "Vantrel/Effects/UltraKey.h"
@@ -73,6 +74,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kCropEffect,
     &kDirectionalBlurEffect,
     &kDropShadowEffect,
+    &kStabilizerEffect,
 };
 
 /// The effect of that match name, or null.

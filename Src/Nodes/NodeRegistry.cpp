@@ -23,6 +23,7 @@
 #include "Src/Filters/Effects/RGBColorCorrectorNode.h"
 #include "Src/Filters/Effects/RGBCurvesNode.h"
 #include "Src/Filters/Effects/SharpenNode.h"
+#include "Src/Filters/Effects/StabilizerWarpNode.h"
 #include "Src/Filters/Effects/ThreeWayColorCorrectorNode.h"
 #include "Src/Filters/Effects/UltraKeyNode.h"
 #include "Src/Filters/Effects/VideoLimiterNode.h"
@@ -108,6 +109,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE Three-Way Color Corrector", Make<ThreeWayColorCorrectorNode>},
     {u"TQ.XQVE Basic 3D", Make<Basic3DNode>, true},
     {u"TQ.XQVE TQCrop", Make<CropNode>},
+    {u"TQ.XQVE SubspaceStabilizer", Make<StabilizerWarpNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

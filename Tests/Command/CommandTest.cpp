@@ -68,6 +68,10 @@ TEST_F(Command, NothingIsReplacedSilently) {
     const Outcome passed = Run("render " + WriteFilm(3, {Effect("Sparkle")}) + " -o " + Path("out.mp4"));
     EXPECT_EQ(passed.status, 2);
     EXPECT_THAT(passed.err, HasSubstr("Sparkle"));
+    const Outcome shaky =
+        Run("render " + WriteFilm(3, {Effect("TQ.XQVE SubspaceStabilizer")}) + " -o " + Path("out.mp4"));
+    EXPECT_EQ(shaky.status, 2) << "nothing was analysed";
+    EXPECT_THAT(shaky.err, HasSubstr("TQ.XQVE SubspaceStabilizer"));
     const Outcome strict =
         Run("render " + WriteFilm(3, {Effect("Sparkle")}) + " -o " + Path("strict.mp4") + " --strict");
     EXPECT_NE(strict.status, 0);

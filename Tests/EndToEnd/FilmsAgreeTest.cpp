@@ -97,6 +97,37 @@ TEST_F(FilmsAgree, ExamplesOnBothFrameworksAndOnTheHost) {
     }
 }
 
+/// By how many levels neighbouring pictures differ on the average, in the half that begins with a column.
+double MeasureUnrest(const Film& film, std::int32_t from) {
+    double sum = 0.0;
+    for (std::size_t i = 1; i < film.pictures.size(); ++i) {
+        const HostPicture& one = *film.pictures[i - 1];
+        const HostPicture& other = *film.pictures[i];
+        for (std::int32_t y = 0; y < one.height; ++y) {
+            const auto* a = reinterpret_cast<const std::uint8_t*>(one.GetRow(y)) + std::ptrdiff_t{4} * from;
+            const auto* b = reinterpret_cast<const std::uint8_t*>(other.GetRow(y)) + std::ptrdiff_t{4} * from;
+            for (std::int32_t x = 0; x < 2 * one.width; ++x) sum += std::abs(a[x] - b[x]);
+        }
+    }
+    const HostPicture& first = *film.pictures.front();
+    return sum / (2.0 * first.width * first.height * static_cast<double>(film.pictures.size() - 1));
+}
+
+TEST_F(FilmsAgree, AShakyClipIsMadeSteadyOnBothFrameworks) {
+    FilmOptions options;
+    options.width = 480;
+    options.height = 270;
+    options.frames = {70, 71, 72, 73, 74};
+    options.deviceMemory = ~std::uint64_t{0};
+    const Film cuda = RenderFilm(VANTREL_EXAMPLES "/stabilizer/stabilizer.otio", options);
+    EXPECT_TRUE(cuda.failures.empty());
+    EXPECT_EQ(cuda.summary.hostFrames, 0);
+    EXPECT_LT(MeasureUnrest(cuda, 240), 0.4 * MeasureUnrest(cuda, 0));
+    options.device = DeviceChoice::kOpenCL;
+    const Difference frameworks = Compare(cuda, RenderFilm(VANTREL_EXAMPLES "/stabilizer/stabilizer.otio", options));
+    EXPECT_LE(frameworks.levels, 1) << frameworks.place;
+}
+
 class WithLittleMemory : public FilmsAgree {
 protected:
     static constexpr std::int32_t kHeight = VANTREL_LARGE_HEIGHT;

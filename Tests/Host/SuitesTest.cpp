@@ -107,6 +107,7 @@ TEST(Suites, OpaqueDataStayAsLongAsTheyAreHeld) {
     ASSERT_EQ(suite.Acquire(instance, &data), 0);
     const Published without(timeline(nullptr));
     EXPECT_EQ(static_cast<const unsigned char*>(data)[2], 3);
+    EXPECT_EQ(static_cast<const unsigned char*>(data)[3], 0) << "so that a text comes to an end";
     std::uint8_t disposed = 0;
     EXPECT_EQ(suite.Release(instance, &disposed), 0);
     EXPECT_EQ(disposed, 1);

@@ -12,6 +12,10 @@ endfunction()
 
 file(REMOVE_RECURSE ${WORK})
 run(${CMAKE_COMMAND} --install ${BUILD} --prefix ${WORK}/prefix)
+# Where the engine looks for it.
+if(NOT EXISTS ${WORK}/prefix/${LIBDIR}/vantrel/Stabilizer.tqx)
+    message(FATAL_ERROR "The stabilizer plug-in isn't installed.")
+endif()
 
 set(flags "")
 foreach(sanitizer IN LISTS SANITIZE)

@@ -16,7 +16,7 @@
 namespace Vantrel {
 namespace {
 
-constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Effects\\Basic3DNode";
+constexpr const char* kModuleKey = R"(..\..\Src\Filters\Effects\Basic3DNode)";
 EffectKernel gPrepareSource{kModuleKey, "cuda_kernel_prepsource", {}};
 EffectKernel gRenderQuad{kModuleKey, "cuda_kernel_renderquad", {}};
 TextureTable gTexture;
