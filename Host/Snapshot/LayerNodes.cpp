@@ -139,10 +139,18 @@ NodePtr LayerNodes::AdjustmentOver(const std::vector<Stacked>& below, const Acti
 Segment LayerNodes::MakeSegment(std::int64_t start, std::int64_t end, const std::vector<ActiveLayer>& layers) {
     const std::int64_t origin = OriginOf(layers);
     Segment segment{start, end, start - origin, nullptr};
+    std::vector<std::int32_t> above;
     const MatteLookup mattes = [&](std::int32_t trackID) -> std::optional<LayerAt> {
         for (const ActiveLayer& layer : layers) {
-            if (layer.trackID != trackID || IsAdjustment(layer)) continue;
-            return LayerAt{layer.placement->anchor, LayerNode(layer, {})};
+            // The engine knows tracks by their clips, and a transition is none.
+            const bool isClip = layer.placement->item != nullptr && !IsAdjustment(layer);
+            if (layer.trackID != trackID || !isClip) continue;
+            // A matte may have one itself, but what comes back to a track above is none.
+            if (std::find(above.begin(), above.end(), trackID) != above.end()) return std::nullopt;
+            above.push_back(trackID);
+            const NodePtr node = LayerNode(layer, mattes);
+            above.pop_back();
+            return LayerAt{layer.placement->anchor, node};
         }
         return std::nullopt;
     };
@@ -151,6 +159,7 @@ Segment LayerNodes::MakeSegment(std::int64_t start, std::int64_t end, const std:
         return std::any_of(stacked.begin(), stacked.end(), [](const Stacked& layer) { return layer.shows; });
     };
     for (const ActiveLayer& layer : layers) {
+        above = {layer.trackID};
         if (!IsAdjustment(layer)) {
             stacked.push_back({layer.placement->anchor, LayerNode(layer, mattes), !IsDisabled(layer)});
         } else if (anyShows()) {

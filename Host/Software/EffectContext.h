@@ -6,6 +6,7 @@
 #include <cmath>
 #include <cstdint>
 #include <functional>
+#include <optional>
 #include <string>
 
 #include "Host/Software/LayerPicture.h"
@@ -20,8 +21,12 @@ struct EffectContext {
     std::function<std::array<double, 4>(std::int32_t index)> value;
     /// Parameter time.
     std::int64_t time = 0;
+    /// Since the clip's start on its track.
+    std::int64_t itemTime = 0;
+    /// What the media's own timecode shows; none for stills.
+    std::optional<std::int64_t> mediaTimecode;
     View view;
-    /// The picture of the layer that a matte comes from, of the view's size; transparent if there is none.
+    /// The picture of the layer that a matte comes from, of the view's size; empty if there is none.
     std::function<Picture()> matte;
 
     [[nodiscard]] double Number(std::int32_t index) const { return value(index)[0]; }

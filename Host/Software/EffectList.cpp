@@ -17,6 +17,7 @@
 #include "Host/Software/Effects/RGBColorCorrector.h"
 #include "Host/Software/Effects/Sharpen.h"
 #include "Host/Software/Effects/ThreeWayColorCorrector.h"
+#include "Host/Software/Effects/TrackMatte.h"
 #include "Host/Software/Effects/UltraKey.h"
 #include "Host/Software/Effects/VideoLimiter.h"
 #include "Vantrel/Effects/Invert.h"
@@ -77,6 +78,7 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"TQ.XQVE Three-Way Color Corrector", RunThreeWayColorCorrector},
         {"TQ.XQVE Basic 3D", RunBasic3D},
         {"TQ.XQVE TQCrop", RunCrop},
+        {"TQ.XQVE Legacy Key Track Matte", RunTrackMatte},
     };
     const auto found = kFunctions.find(matchName);
     return found == kFunctions.end() ? nullptr : found->second;

@@ -59,15 +59,16 @@ std::string FillInParameters(const EffectDetail& effect, std::int64_t time) {
     return filled;
 }
 
-void EffectRunner::Run(const Node& node, std::int64_t time, const View& view, std::function<Picture()> matte,
-                       LayerPicture& layer) {
+void EffectRunner::Run(const Node& node, EffectContext context, LayerPicture& layer) {
     const EffectDetail& effect = *node.AsEffect();
+    const std::int64_t time = context.time;
     if (const EffectFunction function = FindEffectFunction(effect.matchName)) {
-        const auto value = [&node, time](std::int32_t index) {
+        context.matchName = effect.matchName;
+        context.value = [&node, time](std::int32_t index) {
             const Parameter* parameter = node.FindParameter(index);
             return parameter ? parameter->At(time) : ParameterValue{};
         };
-        function({effect.matchName, value, time, view, std::move(matte)}, layer);
+        function(context, layer);
     } else if (!effect.filterGraph.empty()) {
         mGraphs.Run(FillInParameters(effect, time), time, layer);
     } else {

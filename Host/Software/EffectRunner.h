@@ -24,11 +24,9 @@ public:
     /// @param strict  an effect without a software version is a failure
     explicit EffectRunner(bool strict) : mStrict(strict) {}
 
-    /// @param time   parameter time
-    /// @param matte  gives the picture of the layer that a matte comes from
+    /// @param context  lacks match name and parameters, which the effect's node tells
     /// Throws std::runtime_error.
-    void Run(const Node& effect, std::int64_t time, const View& view, std::function<Picture()> matte,
-             LayerPicture& layer);
+    void Run(const Node& effect, EffectContext context, LayerPicture& layer);
     /// Takes note of something that shows as if it weren't there.
     void NotePassedThrough(const std::string& matchName);
     [[nodiscard]] std::vector<std::string> GetPassedThrough() const;

@@ -3,13 +3,16 @@
 #include "Host/Software/NodeRenderer.h"
 
 #include <algorithm>
+#include <optional>
 #include <stdexcept>
+#include <string>
 #include <utility>
 
 #include "Host/Software/Effects/Dissolves.h"
 #include "Host/Software/Effects/FrameRepairs.h"
 #include "Host/Software/Effects/MulticamGrid.h"
 #include "Host/Software/Transitions.h"
+#include "Vantrel/HostSuites.h"
 
 namespace Vantrel::Host::Software {
 
@@ -35,6 +38,12 @@ View AngleView(const View& view, bool besideProgram) {
             static_cast<std::int32_t>(static_cast<float>(angle.sequenceWidth) / static_cast<float>(view.ScaleX()));
     }
     return angle;
+}
+
+std::optional<std::int64_t> MediaTimecode(const Node& media, const ItemTimes& times) {
+    if (!media.AsMedia() || (media.flags & kNodeFlag_Still) != 0) return std::nullopt;
+    const std::string* start = media.FindProperty("MediaNode::StartTimecodeOffset");
+    return times.parameters + (start ? std::stoll(*start) : 0);
 }
 
 LayerPicture AsLayer(Picture picture, const View& view) {
@@ -117,8 +126,13 @@ LayerPicture NodeRenderer::RenderClip(const Node& clip, const ItemTimes& times, 
         const Node& effect = *clip.operators[i];
         if (IsIntrinsic(effect)) continue;
         const NodeInput& matte = effect.AsEffect()->matte;
-        mEffects.Run(
-            effect, times.parameters, view, [&] { return RenderInput(matte, times.item, view); }, layer);
+        EffectContext context;
+        context.time = times.parameters;
+        context.itemTime = times.item;
+        context.mediaTimecode = MediaTimecode(*input.node, times);
+        context.view = view;
+        if (matte.node) context.matte = [&] { return RenderInput(matte, times.item, view); };
+        mEffects.Run(effect, std::move(context), layer);
     }
     return layer;
 }

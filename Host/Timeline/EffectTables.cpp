@@ -76,26 +76,7 @@ EffectTable Timecode() {
     return table.Finish();
 }
 
-EffectTable Simple(const char* matchName, std::initializer_list<Parameter> parameters, bool timeDependent = false) {
-    Builder table(matchName);
-    std::int32_t index = 0;
-    for (const Parameter& parameter : parameters) table.Row(index++, parameter.name, parameter.type, parameter.value);
-    if (timeDependent) table.DependsOnTime();
-    return table.Finish();
-}
-
-Parameter P(const char* name, Type type, ParameterValue value = {}) {
-    Parameter parameter;
-    parameter.name = name;
-    parameter.type = type;
-    parameter.value = value;
-    return parameter;
-}
-
 void AddSpatial(std::vector<EffectTable>& tables) {
-    tables.push_back(
-        Simple("TQ.XQVE Legacy Key Track Matte",
-               {P("matte_track", Type::kInt), P("composite_using", Type::kInt), P("reverse", Type::kBool)}));
     tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte", 4));
     tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte 8", 8));
     tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte 16", 16));

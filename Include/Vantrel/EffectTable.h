@@ -32,6 +32,7 @@
 #include "Vantrel/Effects/Stabilizer.h"
 #include "Vantrel/Effects/ThreeWayColorCorrector.h"
 #include "Vantrel/Effects/Tint.h"
+#include "Vantrel/Effects/TrackMatte.h"
 #include "Vantrel/Effects/UltraKey.h"
 #include "Vantrel/Effects/VideoLimiter.h"
 
@@ -72,6 +73,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kSharpenEffect,
     &kBasic3DEffect,
     &kCropEffect,
+    &kTrackMatteEffect,
     &kDirectionalBlurEffect,
     &kDropShadowEffect,
     &kStabilizerEffect,

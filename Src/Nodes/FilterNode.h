@@ -43,6 +43,8 @@ public:
 
     /// Keeps this frame out of the store; ends with EndFrame. A parent calls it before it renders the input.
     void SuppressCaching() { mCaching = false; }
+    /// Takes that back within a frame, for a second picture of the same input in which nobody does its work.
+    void ResumeCaching() { mCaching = true; }
     [[nodiscard]] bool IsCaching() const { return mCaching; }
     /// Milliseconds of device time of the last render; 0.0 when not measured.
     [[nodiscard]] float GetRenderTime() const { return mRenderTime; }

@@ -25,6 +25,7 @@
 #include "Src/Filters/Effects/SharpenNode.h"
 #include "Src/Filters/Effects/StabilizerWarpNode.h"
 #include "Src/Filters/Effects/ThreeWayColorCorrectorNode.h"
+#include "Src/Filters/Effects/TrackMatteNode.h"
 #include "Src/Filters/Effects/UltraKeyNode.h"
 #include "Src/Filters/Effects/VideoLimiterNode.h"
 #include "Src/Filters/HostRenderSubtreeNode.h"
@@ -110,6 +111,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE Basic 3D", Make<Basic3DNode>, true},
     {u"TQ.XQVE TQCrop", Make<CropNode>},
     {u"TQ.XQVE SubspaceStabilizer", Make<StabilizerWarpNode>},
+    {u"TQ.XQVE Legacy Key Track Matte", Make<TrackMatteNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

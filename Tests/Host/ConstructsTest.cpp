@@ -226,6 +226,20 @@ TEST(Constructs, ATrackMatteKnowsItsLayer) {
               OperatorsFingerprint(*fillOf(1)->inputs.at(1).node, 1, 0, description));
 }
 
+TEST(Constructs, AMatteHasItsOwnMatteButNotThatOfATrackAbove) {
+    const auto matted = [](double track) {
+        return Track(
+            {Clip("clip", 0, 10, Effects({Effect("TQ.XQVE Legacy Key Track Matte", {{"matte_track", track}})}))});
+    };
+    const auto matteOf = [](const NodePtr& clip) { return clip->operators.at(0)->AsEffect()->matte.node; };
+    const NodePtr chain = Described(Timeline({Track({Clip("c", 0, 10)}), matted(1), matted(2)})).Segments().at(0).root;
+    EXPECT_NE(matteOf(matteOf(chain->inputs.at(2).node)), nullptr);
+    const NodePtr ring = Described(Timeline({matted(2), matted(1), matted(3)})).Segments().at(0).root;
+    ASSERT_NE(matteOf(ring->inputs.at(0).node), nullptr);
+    EXPECT_EQ(matteOf(matteOf(ring->inputs.at(0).node)), nullptr);
+    EXPECT_EQ(matteOf(ring->inputs.at(2).node), nullptr) << "its own";
+}
+
 TEST(Constructs, EffectsOnATrackMakeItANestedSequence) {
     const Described described(
         Timeline({Track({Clip("a", 0, 10), Clip("b", 0, 10)}, Effects({Effect("TQ.XQVE Invert")}))}));
