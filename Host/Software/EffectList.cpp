@@ -9,6 +9,7 @@
 #include "Host/Software/Effects/Curves.h"
 #include "Host/Software/Effects/DirectionalBlur.h"
 #include "Host/Software/Effects/DropShadow.h"
+#include "Host/Software/Effects/GarbageMatte.h"
 #include "Host/Software/Effects/GaussianBlur.h"
 #include "Host/Software/Effects/Invert.h"
 #include "Host/Software/Effects/Levels.h"
@@ -79,6 +80,9 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"TQ.XQVE Basic 3D", RunBasic3D},
         {"TQ.XQVE TQCrop", RunCrop},
         {"TQ.XQVE Legacy Key Track Matte", RunTrackMatte},
+        {"TQ.XQVE Garbage Matte", RunGarbageMatte},
+        {"TQ.XQVE Garbage Matte 8", RunGarbageMatte},
+        {"TQ.XQVE Garbage Matte 16", RunGarbageMatte},
     };
     const auto found = kFunctions.find(matchName);
     return found == kFunctions.end() ? nullptr : found->second;

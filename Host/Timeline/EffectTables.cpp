@@ -52,18 +52,6 @@ private:
     EffectTable mTable;
 };
 
-/// A polygon of `count` corners that goes round the frame's edge clockwise from the top left.
-EffectTable GarbageMatte(const char* matchName, std::int32_t count) {
-    Builder table(matchName);
-    const std::int32_t perSide = count / 4;
-    for (std::int32_t i = 0; i < count; ++i) {
-        const double along = static_cast<double>(i % perSide) / perSide;
-        const ParameterValue corners[] = {{along, 0}, {1, along}, {1 - along, 1}, {0, 1 - along}};
-        table.Row(i, "corner" + std::to_string(i), Type::kPoint, corners[i / perSide]);
-    }
-    return table.Finish();
-}
-
 EffectTable Timecode() {
     Builder table("TQ.XQVE Lspr Timecode");
     table.Row(0, "position", Type::kPoint, {0.5, 0.9})
@@ -74,12 +62,6 @@ EffectTable Timecode() {
         .Rows(8, Type::kInt, {{"starting_frame", 0}, {"label", 0}})
         .DependsOnTime();
     return table.Finish();
-}
-
-void AddSpatial(std::vector<EffectTable>& tables) {
-    tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte", 4));
-    tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte 8", 8));
-    tables.push_back(GarbageMatte("TQ.XQVE Garbage Matte 16", 16));
 }
 
 /// An effect that the engine lists itself.
@@ -97,7 +79,6 @@ EffectTable FromEngine(const EffectRow& effect) {
 std::vector<EffectTable> MakeTables() {
     std::vector<EffectTable> tables;
     for (const EffectRow* effect : kEffectTable) tables.push_back(FromEngine(*effect));
-    AddSpatial(tables);
     tables.push_back(Timecode());
     return tables;
 }

@@ -20,6 +20,7 @@
 #include "Vantrel/Effects/FastColorCorrector.h"
 #include "Vantrel/Effects/Flips.h"
 #include "Vantrel/Effects/GammaCorrection.h"
+#include "Vantrel/Effects/GarbageMatte.h"
 #include "Vantrel/Effects/GaussianBlur.h"
 #include "Vantrel/Effects/Intrinsics.h"
 #include "Vantrel/Effects/Invert.h"
@@ -74,6 +75,9 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kBasic3DEffect,
     &kCropEffect,
     &kTrackMatteEffect,
+    &kGarbageMatteEffect,
+    &kGarbageMatte8Effect,
+    &kGarbageMatte16Effect,
     &kDirectionalBlurEffect,
     &kDropShadowEffect,
     &kStabilizerEffect,

@@ -14,6 +14,7 @@
 #include "Src/Filters/Effects/CropNode.h"
 #include "Src/Filters/Effects/DirectionalBlurNode.h"
 #include "Src/Filters/Effects/DropShadowNode.h"
+#include "Src/Filters/Effects/GarbageMatteNode.h"
 #include "Src/Filters/Effects/GaussianBlurNode.h"
 #include "Src/Filters/Effects/InvertNode.h"
 #include "Src/Filters/Effects/LevelsNode.h"
@@ -112,6 +113,9 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE TQCrop", Make<CropNode>},
     {u"TQ.XQVE SubspaceStabilizer", Make<StabilizerWarpNode>},
     {u"TQ.XQVE Legacy Key Track Matte", Make<TrackMatteNode>},
+    {u"TQ.XQVE Garbage Matte", Make<GarbageMatteNode>},
+    {u"TQ.XQVE Garbage Matte 8", Make<GarbageMatteNode>},
+    {u"TQ.XQVE Garbage Matte 16", Make<GarbageMatteNode>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},

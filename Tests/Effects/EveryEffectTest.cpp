@@ -138,6 +138,10 @@ constexpr EffectCase kCases[] = {
     // dark light rise by 13; steep settings of transparency and tolerance make steps of the matte.
     {"TQ.XQVE Ultra Key", 0.03, false, 20.0},
     // Up to seven times what two neighbours differ by.
+    // Places on an edge are rounded.
+    {"TQ.XQVE Garbage Matte", 0.0, true, 250.0},
+    {"TQ.XQVE Garbage Matte 8", 0.0, true, 250.0},
+    {"TQ.XQVE Garbage Matte 16", 0.0, true, 250.0},
     {"TQ.XQVE Sharpen", 0.0, true, 10.0},
     {"TQ.XQVE RGB Color Corrector", 0.02, true, 30.0},
     {"TQ.XQVE Three-Way Color Corrector", 0.02, true, 30.0},
