@@ -35,6 +35,7 @@
 #include "Src/Filters/MulticamNode.h"
 #include "Src/Filters/NestedTimelineNode.h"
 #include "Src/Filters/SWHostRenderClipPrefetch.h"
+#include "Src/Filters/Synthetics/ColorBarsNode.h"
 #include "Src/Filters/Synthetics/SolidColorNode.h"
 #include "Src/Filters/Transitions/AdditiveDissolveNode.h"
 #include "Src/Filters/Transitions/CrossDissolveNode.h"
@@ -116,6 +117,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE Garbage Matte", Make<GarbageMatteNode>},
     {u"TQ.XQVE Garbage Matte 8", Make<GarbageMatteNode>},
     {u"TQ.XQVE Garbage Matte 16", Make<GarbageMatteNode>},
+    {u"1111577171", Make<ProxyNode<MediaNode, ColorBarsNode>>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1414680150", Make<ProxyNode<MediaNode, SolidColorNode>>},
