@@ -18,6 +18,7 @@
 #include "Host/Software/Effects/RGBColorCorrector.h"
 #include "Host/Software/Effects/Sharpen.h"
 #include "Host/Software/Effects/ThreeWayColorCorrector.h"
+#include "Host/Software/Effects/Timecode.h"
 #include "Host/Software/Effects/TrackMatte.h"
 #include "Host/Software/Effects/UltraKey.h"
 #include "Host/Software/Effects/VideoLimiter.h"
@@ -83,6 +84,7 @@ EffectFunction FindEffectFunction(const std::string& matchName) {
         {"TQ.XQVE Garbage Matte", RunGarbageMatte},
         {"TQ.XQVE Garbage Matte 8", RunGarbageMatte},
         {"TQ.XQVE Garbage Matte 16", RunGarbageMatte},
+        {"TQ.XQVE Lspr Timecode", RunTimecode},
     };
     const auto found = kFunctions.find(matchName);
     return found == kFunctions.end() ? nullptr : found->second;

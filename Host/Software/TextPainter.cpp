@@ -8,17 +8,14 @@
 #include <algorithm>
 #include <cctype>
 #include <cmath>
-#include <filesystem>
 #include <utility>
 
 #include "Host/Media/FFmpegHandles.h"
+#include "Tarn/Text.h"
 
 namespace Vantrel::Host::Software {
 
 namespace {
-
-constexpr const char* kFontFolders[] = {"/usr/share/fonts/truetype/liberation", "/usr/share/fonts/truetype/liberation2",
-                                        "/usr/share/fonts/liberation", "/usr/local/share/fonts/liberation"};
 
 /// FreeType counts in 64ths of a pixel, its matrices in 65536ths.
 constexpr double kUnit = 64.0;
@@ -81,11 +78,8 @@ void LayOver(float* below, const Pixel& color, double coverage) {
 std::string FindFontFile(const std::string& family) {
     const std::string stem = StemOf(family);
     for (const std::string& name : {stem, std::string("LiberationSans-Regular")}) {
-        for (const char* folder : kFontFolders) {
-            const std::filesystem::path path = std::filesystem::path(folder) / (name + ".ttf");
-            std::error_code ignored;
-            if (std::filesystem::exists(path, ignored)) return path.string();
-        }
+        const std::string path = Tarn::FindFontFile(name + ".ttf");
+        if (!path.empty()) return path;
     }
     throw MediaError("no font for text: the Liberation fonts aren't installed (Debian package fonts-liberation)");
 }

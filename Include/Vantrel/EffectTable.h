@@ -32,6 +32,7 @@
 #include "Vantrel/Effects/Sharpen.h"
 #include "Vantrel/Effects/Stabilizer.h"
 #include "Vantrel/Effects/ThreeWayColorCorrector.h"
+#include "Vantrel/Effects/Timecode.h"
 #include "Vantrel/Effects/Tint.h"
 #include "Vantrel/Effects/TrackMatte.h"
 #include "Vantrel/Effects/UltraKey.h"
@@ -78,6 +79,7 @@ inline constexpr const EffectRow* kEffectTable[] = {
     &kGarbageMatteEffect,
     &kGarbageMatte8Effect,
     &kGarbageMatte16Effect,
+    &kTimecodeEffect,
     &kDirectionalBlurEffect,
     &kDropShadowEffect,
     &kStabilizerEffect,

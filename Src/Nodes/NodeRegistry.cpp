@@ -26,6 +26,7 @@
 #include "Src/Filters/Effects/SharpenNode.h"
 #include "Src/Filters/Effects/StabilizerWarpNode.h"
 #include "Src/Filters/Effects/ThreeWayColorCorrectorNode.h"
+#include "Src/Filters/Effects/TimeCodeNode.h"
 #include "Src/Filters/Effects/TrackMatteNode.h"
 #include "Src/Filters/Effects/UltraKeyNode.h"
 #include "Src/Filters/Effects/VideoLimiterNode.h"
@@ -117,6 +118,7 @@ constexpr RegistryEntry kEntries[] = {
     {u"TQ.XQVE Garbage Matte", Make<GarbageMatteNode>},
     {u"TQ.XQVE Garbage Matte 8", Make<GarbageMatteNode>},
     {u"TQ.XQVE Garbage Matte 16", Make<GarbageMatteNode>},
+    {u"TQ.XQVE Lspr Timecode", Make<TimeCodeNode>},
     {u"1111577171", Make<ProxyNode<MediaNode, ColorBarsNode>>},
     {u"1112293707", Make<ProxyNode<MediaNode, SolidColorNode>>},
     {u"1129270354", Make<ProxyNode<MediaNode, SolidColorNode>>},
