@@ -45,9 +45,9 @@ const struct {
     {"directional blur, 30 degrees", "TQ.XQVE Motion Blur", {{0, 30.0}, {1, 30.0}}},
     {"directional blur, 45 degrees", "TQ.XQVE Motion Blur", {{0, 45.0}, {1, 30.0}}},
     {"directional blur, 50 degrees", "TQ.XQVE Motion Blur", {{0, 50.0}, {1, 30.0}}},
+    {"directional blur, level", "TQ.XQVE Motion Blur", {{0, 90.0}, {1, 30.0}}},
     {"drop shadow, soft", "TQ.XQVE Drop Shadow", {{1, 128.0}, {3, 20.0}, {4, 30.0}}},
     {"drop shadow, hard", "TQ.XQVE Drop Shadow", {{1, 128.0}, {3, 20.0}}},
-    {"directional blur, level", "TQ.XQVE Motion Blur", {{0, 90.0}, {1, 30.0}}},
 };
 
 void Check(bool good) {

@@ -23,8 +23,8 @@ constexpr Kernel<DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, DeviceB
 constexpr Kernel<DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, PixelFormat, DeviceBuffer, std::int32_t,
                  std::int32_t, std::int32_t, std::int32_t, bool, bool>
     kReduceRows{R"(..\..\Kiln\Modules\Blur)", "BlurReduceRowsKernel"};
-constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, PixelFormat, DeviceBuffer,
-                 std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t>
+constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, std::int32_t, std::int32_t, DeviceBuffer, std::int32_t,
+                 std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t, std::int32_t>
     kFinish{R"(..\..\Kiln\Modules\Blur)", "BlurFinishKernel"};
 
 constexpr PixelFormat kWorkFormat = kPixelFormat_GPU_BGRA_4444_32f;
@@ -170,8 +170,8 @@ Status GaussianBlur(const DeviceRef& device, DeviceBuffer source, std::int32_t s
     }
     if (Ostrand::Failed(status)) return status;
     return kFinish.Launch(device, ShapeFor(targetWidth, targetHeight), format, target, PitchOf(targetRowBytes, format),
-                          targetWidth, targetHeight, kWorkFormat, picture.data, picture.pitch, picture.width,
-                          picture.height, x.step, x.first, y.step, y.first);
+                          targetWidth, targetHeight, picture.data, picture.pitch, picture.width, picture.height, x.step,
+                          x.first, y.step, y.first);
 }
 
 }  // namespace Kiln
