@@ -38,6 +38,7 @@ const struct {
     {"stabilizer, cropped and scaled", "TQ.XQVE SubspaceStabilizer", {}},
     {"stabilizer, whole", "TQ.XQVE SubspaceStabilizer", {{8, 0.0}}},
     {"basic 3D, highlight", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, -20.0}, {2, 20.0}, {3, 1.0}}},
+    {"garbage matte, 16 corners", "TQ.XQVE Garbage Matte 16", {{8, 0.5}, {10, 0.3}}},
     {"timecode", "TQ.XQVE Lspr Timecode", {}},
     {"crop", "TQ.XQVE TQCrop", {{0, 10.0}, {1, 20.0}, {2, 5.0}, {3, 15.0}}},
     {"crop, zoom", "TQ.XQVE TQCrop", {{0, 10.0}, {1, 20.0}, {2, 5.0}, {3, 15.0}, {4, 1.0}}},

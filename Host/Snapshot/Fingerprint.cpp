@@ -83,9 +83,17 @@ private:
             mHasher.Number(static_cast<std::int64_t>(effect.opaqueData.size()));
             mHasher.Bytes(effect.opaqueData.data(), effect.opaqueData.size());
             Parameters(effect.parameters, times.parameters);
-            if (effect.timeDependent) mHasher.Number(times.parameters);
+            if (effect.timeDependent) Times(node, times);
             Input(effect.matte, times.item);
         }
+    }
+
+    /// All that a burnt-in timecode can show.
+    void Times(const Host::Node& clip, const ItemTimes& times) {
+        mHasher.Number(times.parameters).Number(times.item);
+        const NodePtr& media = clip.inputs.at(0).node;
+        const std::string* start = media ? media->FindProperty("MediaNode::StartTimecodeOffset") : nullptr;
+        if (start) mHasher.Text(*start);
     }
 
     void Parameters(const std::vector<Parameter>& parameters, std::int64_t time) {

@@ -95,7 +95,9 @@ void TrackMatteNode::TurnOnMotion() {
     const FilterNodeRef matte = Ostrand::Query<FilterNode>(mMatteNode);
     if (!matte) return;
     if (const FilterNodeRef motion = FindEffectNode(matte, kMotion)) {
-        motion->ResumeCaching();
+        // The upper one of the two does the work of both.
+        const FilterNodeRef opacity = FindEffectNode(matte, kOpacity);
+        (opacity && FindEffectNode(opacity, kMotion) ? opacity : motion)->ResumeCaching();
         return;
     }
     // The node that was put before the layer does the work of its opacity.
