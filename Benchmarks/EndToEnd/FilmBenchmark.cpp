@@ -32,7 +32,7 @@ using Clock = std::chrono::steady_clock;
 constexpr std::int32_t kWidth = 1920;
 constexpr std::int32_t kHeight = 1080;
 constexpr int kRate = 25;
-constexpr int kClipFrames = 100;
+constexpr int kClipFrames = 50;
 constexpr int kRounds = 3;
 const std::vector<std::string> kSources = {"testsrc2", "gradients=n=4:seed=3",
                                            "mandelbrot=start_scale=2:end_scale=0.1"};
@@ -87,7 +87,7 @@ Json PlainCut(const std::string& folder) { return Json::array({Track(Cut(folder,
 
 /// About half of the frames are part of a dissolve.
 Json Dissolves(const std::string& folder) {
-    constexpr int kHandle = 25;
+    constexpr int kHandle = 12;
     Json items = Json::array();
     for (const Json& clip : Cut(folder, kHandle, kClipFrames - 2 * kHandle)) {
         if (!items.empty()) {

@@ -73,6 +73,7 @@ TEST_F(FilmsAgree, ExamplesOnBothFrameworksAndOnTheHost) {
                     {"time", {3, 24, 51}},
                     {"interlaced", {3, 26, 49, 63, 90}},
                     {"titles", {80, 110}},
+                    {"grade", {3, 20, 30, 60, 77, 90}},
                     {"transitions", {3, 37, 65, 77, 118, 157, 205, 243, 278, 316, 362, 395}}};
     for (const auto& example : examples) {
         SCOPED_TRACE(example.name);

@@ -83,6 +83,7 @@ void PrintJson() {
         for (std::size_t i = 0; i < effect->parameterCount; ++i) {
             nlohmann::json entry = DescribeRow(effect->parameters[i]);
             entry["index"] = effect->parameters[i].index;
+            entry["goesTo"] = effect->parameters[i].goesTo;
             parameters.push_back(entry);
         }
         nlohmann::json entry = DescribeHead(*effect, "effect");
@@ -103,7 +104,7 @@ void PrintJson() {
 template <class Row>
 void PrintRow(const Row& row) {
     const std::string unit = row.unit[0] != '\0' ? std::string(" ") + row.unit : "";
-    std::printf("%-16s %-8s %g to %g%s, default %s\n", row.name, NameOf(row.type), row.minimum, row.maximum,
+    std::printf("%-34s %-8s %g to %g%s, default %s\n", row.name, NameOf(row.type), row.minimum, row.maximum,
                 unit.c_str(), DefaultOf(row).dump().c_str());
 }
 
