@@ -3,6 +3,7 @@
 #include "Tests/Effects/EffectTester.h"
 
 #include <memory>
+#include <sstream>
 #include <utility>
 
 #include <boost/make_shared.hpp>
@@ -56,6 +57,33 @@ private:
     Vellum::PixelAspectRatio mAspect;
 };
 
+std::array<double, 4> RandomValue(Random& random, const ParameterRow& row) {
+    std::array<double, 4> value = row.value;
+    const auto uniform = [&] {
+        return static_cast<double>(random.Uniform(static_cast<float>(row.minimum), static_cast<float>(row.maximum)));
+    };
+    switch (row.type) {
+        case ParameterType::kBool:
+            value[0] = random.Chance(0.3F) ? 1.0 : 0.0;
+            break;
+        case ParameterType::kFloat:
+        case ParameterType::kDouble:
+            // Extremes are far apart in many tables: half of the values stay near the default.
+            value[0] = random.Chance(0.5F) ? uniform() : static_cast<float>(0.8 * row.value[0] + 0.2 * uniform());
+            break;
+        case ParameterType::kColor:
+            for (double& c : value) c = random.Int(0, 4) * 0.25;
+            break;
+        case ParameterType::kPoint:
+            for (std::size_t c = 0; c < 2; ++c) value[c] = static_cast<double>(random.Uniform(-0.2F, 1.2F));
+            break;
+        default:
+            value[0] = random.Int(static_cast<int>(row.minimum), static_cast<int>(row.maximum));
+            if (row.choiceName && !row.choiceName(static_cast<std::int32_t>(value[0]))) value = row.value;
+    }
+    return value;
+}
+
 }  // namespace
 
 VideoFrameRef MakePaddedFrame(const Kiln::DeviceRef& device, Vellum::PixelFormat format, const Picture& picture,
@@ -85,14 +113,40 @@ FakeParam ToParam(const ParameterRow& row, const std::array<double, 4>& value) {
     }
 }
 
-std::map<std::int32_t, FakeParam> MakeParams(const EffectRow& effect, const std::map<std::int32_t, double>& overrides) {
+std::map<std::int32_t, FakeParam> ToParams(const EffectRow& effect, const ParameterValues& values) {
     std::map<std::int32_t, FakeParam> params;
     for (std::size_t i = 0; i < effect.parameterCount; ++i) {
         const ParameterRow& row = effect.parameters[i];
-        const auto found = overrides.find(row.index);
-        params[row.index] = ToParam(row, found == overrides.end() ? row.value : std::array<double, 4>{found->second});
+        const auto found = values.find(row.index);
+        params[row.index] = ToParam(row, found == values.end() ? row.value : found->second);
     }
     return params;
+}
+
+std::map<std::int32_t, FakeParam> MakeParams(const EffectRow& effect, const std::map<std::int32_t, double>& overrides) {
+    ParameterValues values;
+    for (const auto& [index, value] : overrides) values[index] = {value};
+    return ToParams(effect, values);
+}
+
+ParameterValues RandomValues(Random& random, const EffectRow& effect) {
+    const float share = random.Chance(0.5F) ? 1.0F : 0.3F;
+    ParameterValues values;
+    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+        const ParameterRow& row = effect.parameters[i];
+        values[row.index] = random.Chance(share) ? RandomValue(random, row) : row.value;
+    }
+    return values;
+}
+
+std::string Describe(const EffectRow& effect, const ParameterValues& values) {
+    std::ostringstream text;
+    text << effect.matchName;
+    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
+        const auto& value = values.at(effect.parameters[i].index);
+        if (value != effect.parameters[i].value) text << ", " << effect.parameters[i].name << " " << value[0];
+    }
+    return text.str();
 }
 
 EffectTest::EffectTest() {
@@ -115,14 +169,18 @@ VideoNodeRef EffectTest::DescribeEffect(const std::string& matchName, const Para
 }
 
 RenderNodeRef EffectTest::MakeEffect(const std::string& matchName, const Params& params) {
-    const VideoNodeRef description = DescribeEffect(matchName, params);
+    return MakeNode(matchName, DescribeEffect(matchName, params));
+}
+
+RenderNodeRef EffectTest::MakeNode(const std::string& key, const VideoNodeRef& description, Vellum::Rect frameRect) {
     RenderRequirements requirements;
-    requirements.frameRect = {0, 0, 64, 36};
+    requirements.frameRect = frameRect;
+    requirements.pixelAspectRatio = Vellum::kPixelAspectRatio_Square;
     requirements.device = GetDevice();
     bool needsHost = false;
-    const Halden::WideString key = Halden::ToWide(matchName);
-    EXPECT_TRUE(isRegistered(key, GetDevice())) << matchName;
-    return createNode(key, GetDevice(), description, requirements, needsHost);
+    const Halden::WideString wideKey = Halden::ToWide(key);
+    EXPECT_TRUE(isRegistered(wideKey, GetDevice())) << key;
+    return createNode(wideKey, GetDevice(), description, requirements, needsHost);
 }
 
 RenderParams EffectTest::MakeRequest(const VideoFrameRef& input, std::int64_t clipTime) const {

@@ -38,9 +38,16 @@ private:
 
 /// A parameter of the row's type.
 [[nodiscard]] FakeParam ToParam(const ParameterRow& row, const std::array<double, 4>& value);
-/// All parameters of an effect: at their defaults but for the numbers given.
+/// By index: a number, a place's two or a colour's four.
+using ParameterValues = std::map<std::int32_t, std::array<double, 4>>;
+/// All parameters of an effect: at their defaults but for the values given.
+[[nodiscard]] std::map<std::int32_t, FakeParam> ToParams(const EffectRow& effect, const ParameterValues& values);
 [[nodiscard]] std::map<std::int32_t, FakeParam> MakeParams(const EffectRow& effect,
                                                            const std::map<std::int32_t, double>& overrides);
+/// All parameters of an effect, most at their defaults or all at random.
+[[nodiscard]] ParameterValues RandomValues(Random& random, const EffectRow& effect);
+/// The effect and what isn't at its default.
+[[nodiscard]] std::string Describe(const EffectRow& effect, const ParameterValues& values);
 
 /// Runs one effect as the engine does: made by its match name from the registry, over a frame, with the parameters of a
 /// scripted clip, on each device and in each pixel format.
@@ -55,6 +62,9 @@ protected:
     [[nodiscard]] VideoNodeRef DescribeEffect(const std::string& matchName, const Params& params);
     /// The node for an effect of the clip; empty, and the test fails, when there is none of its own.
     [[nodiscard]] RenderNodeRef MakeEffect(const std::string& matchName, const Params& params);
+    /// The node of a key of the registry, or the host's where that one refuses.
+    [[nodiscard]] RenderNodeRef MakeNode(const std::string& key, const VideoNodeRef& description,
+                                         Vellum::Rect frameRect = {0, 0, 64, 36});
     /// Renders `node` over a frame at a clip time. Failures fail the test.
     VideoFrameRef RenderOver(const RenderNodeRef& node, const VideoFrameRef& input, std::int64_t clipTime = 0);
     Status TryRenderOver(const RenderNodeRef& node, const VideoFrameRef& input, VideoFrameRef& output,

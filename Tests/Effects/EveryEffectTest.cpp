@@ -1,8 +1,6 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
 // What holds of every effect: its kernel agrees with the scalar version, and its defaults leave the picture alone.
-#include <sstream>
-
 #include "Host/Software/EffectContext.h"
 #include "Tests/Effects/EffectTester.h"
 #include "Vantrel/EffectTable.h"
@@ -13,7 +11,6 @@ namespace {
 using Host::Software::EffectContext;
 using Host::Software::EffectFunction;
 using Host::Software::LayerPicture;
-using Values = std::map<std::int32_t, std::array<double, 4>>;
 
 /// What makes an effect's comparison its own.
 struct EffectCase {
@@ -27,55 +24,7 @@ struct EffectCase {
     double slack = 1.0;
 };
 
-std::array<double, 4> RandomValue(Random& random, const ParameterRow& row) {
-    std::array<double, 4> value = row.value;
-    const auto uniform = [&] {
-        return static_cast<double>(random.Uniform(static_cast<float>(row.minimum), static_cast<float>(row.maximum)));
-    };
-    switch (row.type) {
-        case ParameterType::kBool:
-            value[0] = random.Chance(0.3F) ? 1.0 : 0.0;
-            break;
-        case ParameterType::kFloat:
-        case ParameterType::kDouble:
-            // Extremes are far apart in many tables: half of the values stay near the default.
-            value[0] = random.Chance(0.5F) ? uniform() : static_cast<float>(0.8 * row.value[0] + 0.2 * uniform());
-            break;
-        case ParameterType::kColor:
-            for (double& c : value) c = random.Int(0, 4) * 0.25;
-            break;
-        case ParameterType::kPoint:
-            for (std::size_t c = 0; c < 2; ++c) value[c] = static_cast<double>(random.Uniform(-0.2F, 1.2F));
-            break;
-        default:
-            value[0] = random.Int(static_cast<int>(row.minimum), static_cast<int>(row.maximum));
-            if (row.choiceName && !row.choiceName(static_cast<std::int32_t>(value[0]))) value = row.value;
-    }
-    return value;
-}
-
-/// Most parameters at their defaults, some at random.
-Values RandomValues(Random& random, const EffectRow& effect) {
-    const float share = random.Chance(0.5F) ? 1.0F : 0.3F;
-    Values values;
-    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
-        const ParameterRow& row = effect.parameters[i];
-        values[row.index] = random.Chance(share) ? RandomValue(random, row) : row.value;
-    }
-    return values;
-}
-
-std::string Describe(const EffectRow& effect, const Values& values) {
-    std::ostringstream text;
-    text << effect.matchName;
-    for (std::size_t i = 0; i < effect.parameterCount; ++i) {
-        const auto& value = values.at(effect.parameters[i].index);
-        if (value != effect.parameters[i].value) text << ", " << effect.parameters[i].name << " " << value[0];
-    }
-    return text.str();
-}
-
-bool Softens(const EffectRow& effect, const Values& values) {
+bool Softens(const EffectRow& effect, const ParameterValues& values) {
     for (std::size_t i = 0; i < effect.parameterCount; ++i) {
         const ParameterRow& row = effect.parameters[i];
         if (std::string(row.name) == "selection_soften" && values.at(row.index)[0] > 0.0) return true;
@@ -85,15 +34,11 @@ bool Softens(const EffectRow& effect, const Values& values) {
 
 class EveryEffect : public EffectTest {
 protected:
-    Picture OnDevice(const EffectRow& effect, const Values& values, const Picture& picture) {
-        Params params;
-        for (std::size_t i = 0; i < effect.parameterCount; ++i) {
-            params[effect.parameters[i].index] = ToParam(effect.parameters[i], values.at(effect.parameters[i].index));
-        }
-        return Apply(effect.matchName, params, picture);
+    Picture OnDevice(const EffectRow& effect, const ParameterValues& values, const Picture& picture) {
+        return Apply(effect.matchName, ToParams(effect, values), picture);
     }
 
-    static Picture OnHost(const EffectRow& effect, const Values& values, const Picture& picture) {
+    static Picture OnHost(const EffectRow& effect, const ParameterValues& values, const Picture& picture) {
         const EffectFunction function = Host::Software::FindEffectFunction(effect.matchName);
         EXPECT_NE(function, nullptr) << effect.matchName << " has no scalar version";
         LayerPicture layer;
@@ -155,7 +100,7 @@ TEST_P(EveryEffect, AgreesWithItsScalarVersion) {
         ASSERT_NE(effect, nullptr) << effectCase.matchName;
         for (int i = 0; i < kTries; ++i) {
             const Picture picture = RoundTo(RandomPicture(random, random.Int(1, 70), random.Int(1, 40)), GetFormat());
-            const Values values = RandomValues(random, *effect);
+            const ParameterValues values = RandomValues(random, *effect);
             Tolerance tolerance = GetTolerance();
             tolerance.exceptionShare = effectCase.exceptionShare;
             // One pixel of a small picture is more than any share.
@@ -179,7 +124,7 @@ TEST_P(EveryEffect, ItsDefaultsKeepEveryBit) {
     for (const EffectCase& effectCase : kCases) {
         if (!effectCase.neutralByDefault) continue;
         const EffectRow& effect = *FindEffect(effectCase.matchName);
-        Values values;
+        ParameterValues values;
         for (std::size_t i = 0; i < effect.parameterCount; ++i) {
             values[effect.parameters[i].index] = effect.parameters[i].value;
         }

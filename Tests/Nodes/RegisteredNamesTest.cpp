@@ -38,6 +38,7 @@ void FillAndExit(bool withCuda, bool withOpenCL, DeviceFramework named) {
     const auto names = Kiln::GetRegisteredMatchNames();
     const bool fromCuda = named == DeviceFramework::kCuda;
     if ((afterCuda == names.size()) != fromCuda || (afterCuda != 0) != fromCuda) std::_Exit(1);
+    if (names.size() != (fromCuda ? 58U : 54U)) std::_Exit(4);
     const auto device = boost::make_shared<FakeDevice>(named);
     for (const char16_t* key : kKeys) {
         const bool listed = std::find(names.begin(), names.end(), key) != names.end();

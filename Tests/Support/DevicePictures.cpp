@@ -181,4 +181,16 @@ Picture DownloadFrame(const Kiln::DeviceRef& device, const Kiln::VideoFrameRef& 
     return picture;
 }
 
+void DownloadFrameWords(const Kiln::DeviceRef& device, const Kiln::VideoFrameRef& frame,
+                        std::vector<std::uint32_t>& words) {
+    const Vellum::Rect bounds = frame->GetBounds();
+    const auto rowBytes = static_cast<std::size_t>(Ostrand::Demand<Marl::IFrameRows>(frame)->GetRowBytes());
+    const std::size_t width = static_cast<std::size_t>(bounds.Width()) * PixelBytes(frame->GetPixelFormat());
+    const auto rows = static_cast<std::size_t>(bounds.Height());
+    words.resize(width * rows / sizeof(std::uint32_t));
+    EXPECT_EQ(device->GetBackend().CopyRowsToHost(
+                  words.data(), width, Ostrand::Demand<Marl::IFrameData>(frame)->GetData(), {0, rowBytes}, width, rows),
+              Ostrand::kStatus_OK);
+}
+
 }  // namespace Vantrel::Testing

@@ -2,6 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
+#include <cstdint>
 #include <iosfwd>
 #include <string>
 #include <vector>
@@ -73,5 +74,8 @@ private:
                                               const Picture& picture);
 /// The pixels of a device frame in a format that devices render in. Waits for the device; failures fail the test.
 [[nodiscard]] Picture DownloadFrame(const Kiln::DeviceRef& device, const Kiln::VideoFrameRef& frame);
+/// The same as the frame holds it, row after row: what large pictures are compared by.
+void DownloadFrameWords(const Kiln::DeviceRef& device, const Kiln::VideoFrameRef& frame,
+                        std::vector<std::uint32_t>& words);
 
 }  // namespace Vantrel::Testing
