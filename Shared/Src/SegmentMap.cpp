@@ -16,10 +16,11 @@ SegmentMap::iterator FirstEndingAfter(SegmentMap& map, std::int64_t ticks) {
     return it;
 }
 
-void InsertStretch(SegmentMap& map, SegmentInfo segment, std::int64_t in, std::int64_t out) {
+/// @param next  the first stretch that comes after it
+void InsertStretch(SegmentMap& map, SegmentMap::iterator next, SegmentInfo segment, std::int64_t in, std::int64_t out) {
     segment.in = in;
     segment.out = out;
-    map.emplace(in, std::move(segment));
+    map.emplace_hint(next, in, std::move(segment));
 }
 
 }  // namespace
@@ -39,8 +40,19 @@ void EraseOverlap(SegmentMap& map, std::int64_t in, std::int64_t out) {
 }
 
 void ReplaceSegment(SegmentMap& map, const SegmentInfo& segment) {
-    EraseOverlap(map, segment.in, segment.out);
-    map[segment.in] = segment;
+    // Mostly one stretch stands in the very place: its entry is written over instead of freed and made again.
+    bool isPlaced = false;
+    auto it = FirstEndingAfter(map, segment.in);
+    while (it != map.end() && it->first < segment.out) {
+        if (it->first == segment.in) {
+            it->second = segment;
+            isPlaced = true;
+            ++it;
+        } else {
+            it = map.erase(it);
+        }
+    }
+    if (!isPlaced) map.insert_or_assign(it, segment.in, segment);
 }
 
 void MergeSegment(SegmentMap& map, const SegmentInfo& segment) {
@@ -48,17 +60,17 @@ void MergeSegment(SegmentMap& map, const SegmentInfo& segment) {
     auto it = FirstEndingAfter(map, segment.in);
     while (it != map.end() && it->first < segment.out) {
         SegmentInfo& entry = it->second;
-        if (reached < entry.in) InsertStretch(map, segment, reached, entry.in);
+        if (reached < entry.in) InsertStretch(map, it, segment, reached, entry.in);
         reached = entry.out;
         if (entry.out > segment.out) {
-            InsertStretch(map, entry, segment.out, entry.out);
+            InsertStretch(map, std::next(it), entry, segment.out, entry.out);
             entry.out = segment.out;
         }
         MergeStatistics(entry, segment);
         if (reached >= segment.out) return;
         ++it;
     }
-    if (reached < segment.out) InsertStretch(map, segment, reached, segment.out);
+    if (reached < segment.out) InsertStretch(map, it, segment, reached, segment.out);
 }
 
 }  // namespace Vantrel

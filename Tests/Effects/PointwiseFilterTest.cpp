@@ -78,7 +78,7 @@ protected:
 PointwiseFilterRecord MakeRecord(int type, const std::vector<float>& values) {
     PointwiseFilterRecord record{};
     record.type = type;
-    std::memcpy(&record.r1, values.data(), values.size() * sizeof(float));
+    if (!values.empty()) std::memcpy(&record.r1, values.data(), values.size() * sizeof(float));
     return record;
 }
 

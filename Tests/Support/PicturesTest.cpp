@@ -20,8 +20,10 @@ TEST(PicturesAgree, FindsOneValueThatIsOff) {
     EXPECT_FALSE(result);
     EXPECT_THAT(result.message(), testing::HasSubstr("1 of 527 pixels differ; worst at (30, 16), channel R"));
     EXPECT_TRUE(PicturesAgree(actual, expected, {0.02}));
-    EXPECT_TRUE(PicturesAgree(actual, expected, {0.005, 0.0, false, 1.5 / 527.0}));
-    EXPECT_FALSE(PicturesAgree(actual, expected, {0.005, 0.0, false, 0.5 / 527.0}));
+    EXPECT_TRUE(PicturesAgree(actual, expected, {0.005, 0.0, false, 0.5 / 527.0})) << "one pixel at least";
+    actual.At(0, 0)[1] += 0.01F;
+    EXPECT_FALSE(PicturesAgree(actual, expected, {0.005, 0.0, false, 1.5 / 527.0}));
+    EXPECT_TRUE(PicturesAgree(actual, expected, {0.005, 0.0, false, 2.5 / 527.0}));
     EXPECT_FALSE(PicturesAgree(Picture(31, 16), Picture(31, 17), {100.0}));
 }
 
