@@ -5,7 +5,6 @@
 
 #include "Src/Effects/ColorCorrector_Secondary.h"
 #include "Tests/Effects/EffectTester.h"
-#include "Tests/Effects/KernelArguments.h"
 #include "Vantrel/EffectTable.h"
 
 namespace Vantrel::Testing {
@@ -26,18 +25,9 @@ constexpr std::size_t kCommonCount = 7;
 
 class CorrectorOnEachDevice : public EffectTest {
 protected:
-    struct Outcome {
-        Status status;
-        Picture picture;
-        std::vector<KernelArguments::List> kernels;
-    };
+    using Outcome = Recorded;
     Outcome Run(const char* matchName, const Overrides& overrides, const Picture& picture) {
-        const KernelArguments recorder;
-        const RenderNodeRef node = MakeEffect(matchName, MakeParams(*FindEffect(matchName), overrides));
-        const VideoFrameRef input = UploadFrame(GetDevice(), GetFormat(), picture);
-        VideoFrameRef output;
-        const Status status = TryRenderOver(node, input, output);
-        return {status, DownloadFrame(GetDevice(), output ? output : input), recorder.kernels};
+        return Record(matchName, MakeParams(*FindEffect(matchName), overrides), picture);
     }
 
     [[nodiscard]] Picture MakePicture(int width, int height) {

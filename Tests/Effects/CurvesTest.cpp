@@ -88,16 +88,6 @@ TEST_P(CurvesOnEachDevice, PointsInAnyDisorderGiveNumbers) {
     for (const float value : lifted.pixels) EXPECT_FALSE(std::isnan(value));
 }
 
-TEST_P(CurvesOnEachDevice, ThereIsNoViewOfTonalRanges) {
-    for (const char* name : {kLumaCurve, kRgbCurves}) {
-        const RenderNodeRef node = MakeEffect(name, {{0, std::int32_t{2}}});
-        VideoFrameRef output;
-        const Picture in = Levels({0.5F});
-        EXPECT_EQ(TryRenderOver(node, MakePaddedFrame(GetDevice(), GetFormat(), in, 1), output),
-                  Ostrand::kStatus_Failure);
-    }
-}
-
 INSTANTIATE_TEST_SUITE_P(Devices, CurvesOnEachDevice, ::testing::ValuesIn(AllDeviceCases()), NameOfCase);
 
 }  // namespace

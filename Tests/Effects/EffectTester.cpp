@@ -221,4 +221,14 @@ Picture EffectTest::Apply(const std::string& matchName, const Params& params, co
                          RenderOver(node, MakePaddedFrame(GetDevice(), GetFormat(), picture, kSparePixels)));
 }
 
+EffectTest::Recorded EffectTest::Record(const std::string& matchName, const Params& params, const Picture& picture) {
+    constexpr int kSparePixels = 3;
+    const KernelArguments recorder;
+    const RenderNodeRef node = MakeEffect(matchName, params);
+    const VideoFrameRef input = MakePaddedFrame(GetDevice(), GetFormat(), picture, kSparePixels);
+    VideoFrameRef output;
+    const Status status = TryRenderOver(node, input, output);
+    return {status, input, DownloadFrame(GetDevice(), output ? output : input), recorder.kernels};
+}
+
 }  // namespace Vantrel::Testing

@@ -9,6 +9,7 @@
 #include <vector>
 
 #include "Src/Nodes/RenderNodeBase.h"
+#include "Tests/Effects/KernelArguments.h"
 #include "Tests/Support/DevicePictures.h"
 #include "Tests/Support/FakeHost.h"
 #include "Vantrel/Effects/EffectRow.h"
@@ -75,6 +76,15 @@ protected:
                      VideoFrameRef& output);
     /// The effect on a picture, as the device holds it.
     [[nodiscard]] Picture Apply(const std::string& matchName, const Params& params, const Picture& picture);
+
+    /// A render over a frame with spare pixels, and what its kernels were handed.
+    struct Recorded {
+        Status status;
+        VideoFrameRef input;
+        Picture picture;  ///< the input's where nothing came out
+        std::vector<KernelArguments::List> kernels;
+    };
+    [[nodiscard]] Recorded Record(const std::string& matchName, const Params& params, const Picture& picture);
 
     /// What the plain solution reaches on every device, for values of about 1.
     [[nodiscard]] Tolerance GetTolerance() const {

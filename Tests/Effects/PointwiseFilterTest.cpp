@@ -91,25 +91,27 @@ TEST_P(PointwiseFilters, RecordsHoldEachParameterAtItsPlace) {
                      {2, layout},
                      {3, 40.0},
                      {6, 180.0F},
-                     {7, 40.0},
-                     {8, 50.0},
-                     {9, 0.0F},
-                     {11, 50.0},
+                     {7, 30.0},
+                     {8, 60.0},
+                     {9, 60.0F},
+                     {11, 45.0},
                      {21, 51.0},
                      {22, 2.0},
                      {23, 204.0},
                      {24, 10.0},
                      {25, 250.0}}};
     };
-    const auto corrected = [pi](int type, float split) {
-        return MakeRecord(type, {204.0F / 255.0F, 51.0F / 255.0F, 250.0F / 255.0F, 10.0F / 255.0F, 0.5F, 50.0F * 0.01F,
-                                 -pi, 0.70710677F, -0.0F, 0.5F * 0.4F, split});
+    const float turn = 1.04719758F;  // 60 degrees
+    const auto corrected = [pi, turn](int type, float split) {
+        const float direction = std::atan2(std::sin(turn) * 0.3F * 0.5F, std::cos(turn) * 0.3F * 0.5F);
+        return MakeRecord(type,
+                          {204.0F / 255.0F, 51.0F / 255.0F, 250.0F / 255.0F, 10.0F / 255.0F, 0.5F, 45.0F * 0.01F, -pi,
+                           std::cos(-direction) * 0.70710677F, std::sin(-direction) * 0.70710677F, 0.6F * 0.3F, split});
     };
     const Words first{16320, 32640, 65280, 1}, second{65280, 0, 8160, 2};
     const auto procAmp = [](bool split) {
         return Link{"TQ.XQVE ProcAmp", {{0, 10.0F}, {1, 150.0F}, {2, 60.0F}, {3, 80.0F}, {4, split}, {5, 30.0F}}};
     };
-    const float turn = 1.04719758F;
     RenderParams params;
     params.clipTime = 10 * kFrameTicks + 9;
     params.frameTicks = kFrameTicks;
@@ -124,7 +126,10 @@ TEST_P(PointwiseFilters, RecordsHoldEachParameterAtItsPlace) {
             << link.matchName << ", type " << record.type << ": " << text.str();
         EXPECT_EQ(needsNewFrame, record.type == 12 || record.type == 16);
     };
-    check({"TQ.XQVE Alpha Adjust", {{0, 50.0F}, {1, true}, {2, false}, {3, true}}}, MakeRecord(0, {0.5F, 1, 0, 1}));
+    for (const int set : {1, 2, 3}) {
+        check({"TQ.XQVE Alpha Adjust", {{0, 50.0F}, {1, set == 1}, {2, set == 2}, {3, set == 3}}},
+              MakeRecord(0, {0.5F, set == 1 ? 1.0F : 0.0F, set == 2 ? 1.0F : 0.0F, set == 3 ? 1.0F : 0.0F}));
+    }
     check({"KL.XQVE Black & White", {}}, MakeRecord(1, {}));
     check({"TQ.XQVE Brightness & Contrast 2", {{0, 0.0F}, {1, 0.0F}}}, MakeRecord(2, {1, 1, 0, 1, 0, 1}));
     check({"TQ.XQVE Brightness & Contrast 2", {{0, 0.0F}, {1, 100.0F}}}, MakeRecord(2, {0, 0, 0.5F, 0.5F, 0, 1}));
