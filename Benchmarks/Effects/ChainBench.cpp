@@ -1,31 +1,23 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
 // What chains of pointwise filters cost on a 1080p frame: as one launch, filter by filter, and as a multiple of the
-// plainest pass over the frame in place. The three are run in turn, and the least of each counts. Milliseconds are
-// those that all threads worked, which other load hardly touches; they say nothing where the device isn't the
-// processor.
+// plainest pass over the frame in place. The three are run in turn, and the least of each counts. Milliseconds of work
+// say nothing where the device isn't the processor.
 #include <algorithm>
-#include <cstdio>
-#include <cstdlib>
 #include <cstring>
-#include <ctime>
 #include <memory>
-#include <string>
 #include <vector>
 
-#include "Kiln/FrameOperations.h"
-#include "Kiln/Frames.h"
-#include "Src/Filters/Effects/OneKernelEffect.h"
+#include "Benchmarks/Support/KernelBench.h"
 #include "Src/Filters/Effects/PointwiseFilterRecord.h"
-#include "Src/Kernels/CudaDriver.h"
 #include "Src/Kernels/RecordUpload.h"
 
 namespace {
 
 using namespace Vantrel;
+using namespace Vantrel::Benchmarks;
 using Records = std::vector<PointwiseFilterRecord>;
 
-constexpr std::int32_t kWidth = 1920, kHeight = 1080;
 constexpr int kRounds = 15;
 constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Effects\\PointwiseFilterHostNode";
 EffectKernel gKernels[] = {{kModuleKey, "PointwiseFilterHostKernel1", {}},
@@ -62,18 +54,6 @@ const struct {
                {"four fast correctors", {kFast, kFast, kFast, kFast}},
                {"four gammas", {kGamma, kGamma, kGamma, kGamma}}};
 
-void Check(bool good) {
-    if (good) return;
-    std::fprintf(stderr, "vantrel_chain_bench: a kernel failed\n");
-    std::exit(1);
-}
-
-double WorkMilliseconds() {
-    timespec time{};
-    clock_gettime(CLOCK_PROCESS_CPUTIME_ID, &time);
-    return static_cast<double>(time.tv_sec) * 1e3 + static_cast<double>(time.tv_nsec) * 1e-6;
-}
-
 class Bench {
 public:
     Bench(Kiln::DeviceRef device, const KernelFrame& frame) : mDevice(std::move(device)), mFrame(frame) {}
@@ -89,7 +69,7 @@ public:
         KernelArgs args(mDevice->GetFramework(), kernel);
         args.AddAll(mFrame.Data(), mFrame.Pitch(), mFrame.Data(), mFrame.Pitch(), mFrame.Format(), kWidth, kHeight);
         for (const auto& upload : uploads) args.AddAll(upload->GetArgument());
-        Start(kernel, args);
+        Start(mDevice, mFrame, kernel, args);
         const Kiln::TimingMarkRef mark = mDevice->GetCommands()->CreateMark();
         for (const auto& upload : uploads) upload->SetMark(mark);
     }
@@ -97,14 +77,12 @@ public:
         const std::uint64_t kernel = gPass.Find(mDevice);
         KernelArgs args(mDevice->GetFramework(), kernel);
         args.AddAll(mFrame.Data(), mFrame.Pitch(), DeviceValue{0}, std::int32_t{0}, mFrame.Format(), kWidth, kHeight);
-        Start(kernel, args);
+        Start(mDevice, mFrame, kernel, args);
     }
-    /// What `work` takes on a frame of new numbers: filters over and over would run out of range.
+    /// What `work` takes on a fresh frame.
     template <class Work>
     double Time(const Work& work) {
-        Kiln::FillWithColor(mDevice, mFrame.Data(), mFrame.Pitch() * Vantrel::BytesPerPixel(mFrame.Format()),
-                            mFrame.Format(), 0, 0, kWidth, kHeight, {0.2F, 0.4F, 0.6F, 1.0F});
-        Check(!Ostrand::Failed(mDevice->Synchronize()));
+        Refresh(mDevice, mFrame);
         const double start = WorkMilliseconds();
         work();
         Check(!Ostrand::Failed(mDevice->Synchronize()));
@@ -112,24 +90,12 @@ public:
     }
 
 private:
-    void Start(std::uint64_t kernel, KernelArgs& args) {
-        Check(kernel != 0 && !Ostrand::Failed(args.Finish()));
-        const GridSize grid = mFrame.Grid();
-        Check(!Ostrand::Failed(mDevice->GetCommands()->Launch(kernel, grid.x, grid.y, 16, 16, 0)));
-    }
-
     Kiln::DeviceRef mDevice;
     const KernelFrame& mFrame;
 };
 
-void Measure(Kiln::DeviceFramework framework, Vellum::PixelFormat format, const char* name) {
-    const Kiln::DeviceRef device = Kiln::GetPrimaryDevice(framework);
-    if (!device) return;
-    const Kiln::ScopedDeviceAccess access(device);
-    VideoFrameRef frame;
-    Check(!Ostrand::Failed(Kiln::CreateGPUVideoFrame(frame, device, format, kWidth, kHeight, {}, 0, {})));
-    const KernelFrame pixels(frame);
-    Bench bench(device, pixels);
+void Measure(const Kiln::DeviceRef& device, const KernelFrame& frame, const char* name) {
+    Bench bench(device, frame);
     for (const auto& chain : kChains) {
         double pass = 1e9, together = 1e9, apart = 1e9;
         for (int round = 0; round < kRounds; ++round) {
@@ -146,14 +112,4 @@ void Measure(Kiln::DeviceFramework framework, Vellum::PixelFormat format, const 
 
 }  // namespace
 
-int main() {
-    Kiln::Initialize(true);
-    constexpr std::int32_t kCudaVersion = 4000;
-    static_cast<void>(LoadCudaDriver(0, kCudaVersion));
-    using Kiln::DeviceFramework;
-    Measure(DeviceFramework::kCuda, Kiln::kPixelFormat_GPU_BGRA_4444_32f, "CUDA, float");
-    Measure(DeviceFramework::kCuda, Kiln::kPixelFormat_GPU_BGRA_4444_16f, "CUDA, half");
-    Measure(DeviceFramework::kOpenCL, Kiln::kPixelFormat_GPU_BGRA_4444_32f, "OpenCL, float");
-    Kiln::Terminate();
-    return 0;
-}
+int main() { ForEachDevice(&Measure); }

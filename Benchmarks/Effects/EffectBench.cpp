@@ -4,20 +4,15 @@
 // Both are measured in turn, and the least of each counts.
 #include <algorithm>
 #include <chrono>
-#include <cstdio>
-#include <cstdlib>
 #include <vector>
 
-#include "Kiln/FrameOperations.h"
-#include "Kiln/Frames.h"
-#include "Src/Filters/Effects/OneKernelEffect.h"
-#include "Src/Kernels/CudaDriver.h"
+#include "Benchmarks/Support/KernelBench.h"
 
 namespace {
 
 using namespace Vantrel;
+using namespace Vantrel::Benchmarks;
 
-constexpr std::int32_t kWidth = 1920, kHeight = 1080;
 constexpr int kRounds = 15;
 constexpr float kGamma = 1.2F;
 
@@ -60,16 +55,9 @@ std::vector<Row> MakeRows() {
             {"three-way corrector, gamma", threeWay, ThreeWay(kGamma)}};
 }
 
-void Check(bool good) {
-    if (good) return;
-    std::fprintf(stderr, "vantrel_effect_bench: a kernel failed\n");
-    std::exit(1);
-}
-
 /// Milliseconds of one run.
 double Time(const Kiln::DeviceRef& device, const KernelFrame& frame, Row& row) {
     const std::uint64_t kernel = row.kernel.Find(device);
-    Check(kernel != 0);
     KernelArgs args(device->GetFramework(), kernel);
     const auto add = [&args](const auto& value) {
         const auto packed = PackArgument(value);
@@ -83,29 +71,19 @@ double Time(const Kiln::DeviceRef& device, const KernelFrame& frame, Row& row) {
     add(frame.Width());
     add(frame.Height());
     for (const float value : row.values) add(value);
-    Check(!Ostrand::Failed(args.Finish()));
     const auto start = std::chrono::steady_clock::now();
-    const GridSize grid = frame.Grid();
-    Check(!Ostrand::Failed(device->GetCommands()->Launch(kernel, grid.x, grid.y, 16, 16, 0)));
+    Start(device, frame, kernel, args);
     Check(!Ostrand::Failed(device->Synchronize()));
     return std::chrono::duration<double, std::milli>(std::chrono::steady_clock::now() - start).count();
 }
 
-void Measure(Kiln::DeviceFramework framework, Vellum::PixelFormat format, const char* name) {
-    const Kiln::DeviceRef device = Kiln::GetPrimaryDevice(framework);
-    if (!device) return;
-    const Kiln::ScopedDeviceAccess access(device);
-    VideoFrameRef frame;
-    Check(!Ostrand::Failed(Kiln::CreateGPUVideoFrame(frame, device, format, kWidth, kHeight, {}, 0, {})));
-    const KernelFrame pixels(frame);
+void Measure(const Kiln::DeviceRef& device, const KernelFrame& frame, const char* name) {
     std::vector<Row> rows = MakeRows();
     std::vector<double> best(rows.size(), 1e9);
     for (int round = 0; round < kRounds; ++round) {
         for (std::size_t i = 0; i < rows.size(); ++i) {
-            Kiln::FillWithColor(device, pixels.Data(), Ostrand::Demand<Marl::IFrameRows>(frame)->GetRowBytes(), format,
-                                0, 0, kWidth, kHeight, {0.2F, 0.4F, 0.6F, 1.0F});
-            Check(!Ostrand::Failed(device->Synchronize()));
-            best[i] = std::min(best[i], Time(device, pixels, rows[i]));
+            Refresh(device, frame);
+            best[i] = std::min(best[i], Time(device, frame, rows[i]));
         }
     }
     for (std::size_t i = 0; i < rows.size(); ++i) {
@@ -115,15 +93,4 @@ void Measure(Kiln::DeviceFramework framework, Vellum::PixelFormat format, const 
 
 }  // namespace
 
-int main() {
-    Kiln::Initialize(true);
-    constexpr std::int32_t kCudaVersion = 4000;
-    static_cast<void>(LoadCudaDriver(0, kCudaVersion));
-    using Kiln::DeviceFramework;
-    Measure(DeviceFramework::kCuda, Kiln::kPixelFormat_GPU_BGRA_4444_32f, "CUDA, float");
-    Measure(DeviceFramework::kCuda, Kiln::kPixelFormat_GPU_BGRA_4444_16f, "CUDA, half");
-    Measure(DeviceFramework::kOpenCL, Kiln::kPixelFormat_GPU_BGRA_4444_32f, "OpenCL, float");
-    Measure(DeviceFramework::kOpenCL, Kiln::kPixelFormat_GPU_BGRA_4444_16f, "OpenCL, half");
-    Kiln::Terminate();
-    return 0;
-}
+int main() { ForEachDevice(&Measure); }
