@@ -4,6 +4,9 @@
 
 #include <algorithm>
 #include <cmath>
+#include <vector>
+
+#include <boost/container/small_vector.hpp>
 
 namespace Vantrel::Host::Software {
 namespace {
@@ -18,46 +21,45 @@ double CatmullRom(double t) {
 }
 
 struct Taps {
+    /// As many as a pixel needs where the picture isn't reduced to less than a third.
+    using Values = boost::container::small_vector<double, 12>;
+
     int first = 0;
-    std::vector<double> weights;
-    std::vector<double> distances;  // in units of the filter
+    Values weights;
+    Values distances;  // in units of the filter
+
+    void Aim(double place, double footprint, Vellum::RenderQuality quality) {
+        const bool cubic = quality >= Vellum::RenderQuality::kHigh;
+        const double stretch = std::max(1.0, cubic ? footprint : footprint - 0.5);
+        const double radius = (cubic ? 2.0 : 1.0) * stretch;
+        first = static_cast<int>(std::ceil(place - radius - 0.5));
+        const int last = static_cast<int>(std::floor(place + radius - 0.5));
+        weights.clear();
+        distances.clear();
+        double sum = 0.0;
+        for (int i = first; i <= last; ++i) {
+            const double t = (i + 0.5 - place) / stretch;
+            weights.push_back(cubic ? CatmullRom(t) : Tent(t));
+            distances.push_back(t);
+            sum += weights.back();
+        }
+        for (double& weight : weights) weight /= sum;
+    }
 
     /// Is it short of the cubic's end, by more than rounding?
     [[nodiscard]] bool IsWithin(std::size_t tap) const { return std::abs(distances[tap]) < 1.99; }
 };
 
-Taps MakeTaps(double place, double footprint, bool cubic) {
-    const double stretch = std::max(1.0, cubic ? footprint : footprint - 0.5);
-    const double radius = (cubic ? 2.0 : 1.0) * stretch;
-    Taps taps;
-    taps.first = static_cast<int>(std::ceil(place - radius - 0.5));
-    const int last = static_cast<int>(std::floor(place + radius - 0.5));
-    double sum = 0.0;
-    for (int i = taps.first; i <= last; ++i) {
-        const double t = (i + 0.5 - place) / stretch;
-        taps.weights.push_back(cubic ? CatmullRom(t) : Tent(t));
-        taps.distances.push_back(t);
-        sum += taps.weights.back();
-    }
-    for (double& weight : taps.weights) weight /= sum;
-    return taps;
-}
-
 /// An alpha this small is what rounding leaves where negative and positive weights cancel: there is no colour to divide
 /// out.
 constexpr double kLeastAlpha = 1e-5;
 
-}  // namespace
+Pixel Nearest(const Picture& picture, double u, double v) {
+    return picture.Get(std::clamp(static_cast<int>(std::floor(u)), 0, picture.width - 1),
+                       std::clamp(static_cast<int>(std::floor(v)), 0, picture.height - 1));
+}
 
-Pixel Sample(const Picture& picture, double u, double v, double footprintU, double footprintV,
-             Vellum::RenderQuality quality) {
-    if (quality < Vellum::RenderQuality::kMedium) {
-        return picture.Get(std::clamp(static_cast<int>(std::floor(u)), 0, picture.width - 1),
-                           std::clamp(static_cast<int>(std::floor(v)), 0, picture.height - 1));
-    }
-    const bool cubic = quality >= Vellum::RenderQuality::kHigh;
-    const Taps across = MakeTaps(u, footprintU, cubic);
-    const Taps down = MakeTaps(v, footprintV, cubic);
+Pixel SumTaps(const Picture& picture, const Taps& across, const Taps& down, bool cubic) {
     Pixel sum{};
     Pixel least{HUGE_VAL, HUGE_VAL, HUGE_VAL, 0.0};
     Pixel most{-HUGE_VAL, -HUGE_VAL, -HUGE_VAL, 0.0};
@@ -85,11 +87,37 @@ Pixel Sample(const Picture& picture, double u, double v, double footprintU, doub
     return out;
 }
 
+}  // namespace
+
+Pixel Sample(const Picture& picture, double u, double v, double footprintU, double footprintV,
+             Vellum::RenderQuality quality) {
+    if (quality < Vellum::RenderQuality::kMedium) return Nearest(picture, u, v);
+    Taps across, down;
+    across.Aim(u, footprintU, quality);
+    down.Aim(v, footprintV, quality);
+    return SumTaps(picture, across, down, quality >= Vellum::RenderQuality::kHigh);
+}
+
 void Resample(const Picture& source, Picture& target, double scaleX, double scaleY, Vellum::RenderQuality quality) {
+    if (quality < Vellum::RenderQuality::kMedium) {
+        for (int y = 0; y < target.height; ++y) {
+            for (int x = 0; x < target.width; ++x) {
+                target.Set(x, y, Nearest(source, (x + 0.5) / scaleX, (y + 0.5) / scaleY));
+            }
+        }
+        return;
+    }
+    std::vector<Taps> across(static_cast<std::size_t>(target.width));
+    for (int x = 0; x < target.width; ++x) {
+        across[static_cast<std::size_t>(x)].Aim((x + 0.5) / scaleX, 1.0 / scaleX, quality);
+    }
+    Taps down;
     for (int y = 0; y < target.height; ++y) {
+        down.Aim((y + 0.5) / scaleY, 1.0 / scaleY, quality);
         for (int x = 0; x < target.width; ++x) {
-            target.Set(x, y,
-                       Sample(source, (x + 0.5) / scaleX, (y + 0.5) / scaleY, 1.0 / scaleX, 1.0 / scaleY, quality));
+            target.Set(
+                x, y,
+                SumTaps(source, across[static_cast<std::size_t>(x)], down, quality >= Vellum::RenderQuality::kHigh));
         }
     }
 }
