@@ -9,13 +9,6 @@
 namespace Vantrel {
 namespace {
 
-/// The first stretch that ends after a time.
-SegmentMap::iterator FirstEndingAfter(SegmentMap& map, std::int64_t ticks) {
-    auto it = map.upper_bound(ticks);
-    if (it != map.begin() && std::prev(it)->second.out > ticks) --it;
-    return it;
-}
-
 /// @param next  the first stretch that comes after it
 void InsertStretch(SegmentMap& map, SegmentMap::iterator next, SegmentInfo segment, std::int64_t in, std::int64_t out) {
     segment.in = in;
@@ -32,45 +25,66 @@ const SegmentInfo* FindSegment(const SegmentMap& map, std::int64_t ticks) {
     return candidate.out > ticks ? &candidate : nullptr;
 }
 
-void EraseOverlap(SegmentMap& map, std::int64_t in, std::int64_t out) {
-    const auto first = FirstEndingAfter(map, in);
-    auto last = first;
-    while (last != map.end() && last->first < out) ++last;
-    map.erase(first, last);
-}
-
-void ReplaceSegment(SegmentMap& map, const SegmentInfo& segment) {
-    // Mostly one stretch stands in the very place: its entry is written over instead of freed and made again.
-    bool isPlaced = false;
-    auto it = FirstEndingAfter(map, segment.in);
-    while (it != map.end() && it->first < segment.out) {
-        if (it->first == segment.in) {
-            it->second = segment;
-            isPlaced = true;
-            ++it;
+SegmentMap::iterator SegmentCursor::Seek(std::int64_t ticks) {
+    constexpr int kSteps = 3;
+    for (int step = 0; step < kSteps; ++step) {
+        if (mAt != mMap.end() && mAt->second.out <= ticks) {
+            ++mAt;
+        } else if (mAt == mMap.begin() || std::prev(mAt)->second.out <= ticks) {
+            return mAt;
         } else {
-            it = map.erase(it);
+            break;
         }
     }
-    if (!isPlaced) map.insert_or_assign(it, segment.in, segment);
+    mAt = mMap.upper_bound(ticks);
+    if (mAt != mMap.begin() && std::prev(mAt)->second.out > ticks) --mAt;
+    return mAt;
 }
 
-void MergeSegment(SegmentMap& map, const SegmentInfo& segment) {
+const SegmentInfo* SegmentCursor::Find(std::int64_t ticks) {
+    const auto it = Seek(ticks);
+    return it != mMap.end() && it->first <= ticks ? &it->second : nullptr;
+}
+
+void SegmentCursor::Erase(std::int64_t in, std::int64_t out) {
+    const auto first = Seek(in);
+    auto last = first;
+    while (last != mMap.end() && last->first < out) ++last;
+    mAt = mMap.erase(first, last);
+}
+
+void SegmentCursor::Replace(const SegmentInfo& segment) {
+    // Mostly one stretch stands in the very place: its entry is written over instead of freed and made again.
+    auto placed = mMap.end();
+    auto it = Seek(segment.in);
+    while (it != mMap.end() && it->first < segment.out) {
+        if (it->first == segment.in) {
+            it->second = segment;
+            placed = it++;
+        } else {
+            it = mMap.erase(it);
+        }
+    }
+    mAt = placed != mMap.end() ? placed : mMap.insert_or_assign(it, segment.in, segment);
+}
+
+void SegmentCursor::Merge(const SegmentInfo& segment) {
     std::int64_t reached = segment.in;
-    auto it = FirstEndingAfter(map, segment.in);
-    while (it != map.end() && it->first < segment.out) {
+    auto it = Seek(segment.in);
+    for (; it != mMap.end() && it->first < segment.out; ++it) {
         SegmentInfo& entry = it->second;
-        if (reached < entry.in) InsertStretch(map, it, segment, reached, entry.in);
+        if (reached < entry.in) InsertStretch(mMap, it, segment, reached, entry.in);
         reached = entry.out;
         if (entry.out > segment.out) {
-            InsertStretch(map, std::next(it), entry, segment.out, entry.out);
+            InsertStretch(mMap, std::next(it), entry, segment.out, entry.out);
             entry.out = segment.out;
         }
         MergeStatistics(entry, segment);
+        mAt = it;
         if (reached >= segment.out) return;
-        ++it;
     }
-    if (reached < segment.out) InsertStretch(map, it, segment, reached, segment.out);
+    if (reached < segment.out) InsertStretch(mMap, it, segment, reached, segment.out);
+    mAt = it;
 }
 
 }  // namespace Vantrel

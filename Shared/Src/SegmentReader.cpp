@@ -190,7 +190,7 @@ void SegmentReader::AddGap(std::int64_t from, std::int64_t to, bool top) {
 void SegmentReader::AddSegment(const VideoSegmentsHandle& handle, const Segment& segment,
                                const SequenceTarget& target) {
     const SequenceRange& place = segment.clipped;
-    const SegmentInfo* const standing = FindSegment(mState.renderMap, place.in);
+    const SegmentInfo* const standing = mRendered.Find(place.in);
     const bool unchanged = standing && !standing->nested && standing->guid == segment.guid &&
                            standing->in == place.in && standing->out == place.out && standing->offset == place.offset;
     const auto nestedNode = Ostrand::Query<INestedTimelineNode>(target.parentTree);
@@ -205,8 +205,8 @@ void SegmentReader::AddSegment(const VideoSegmentsHandle& handle, const Segment&
 SegmentVerdict SegmentReader::PlaceSegment(const VideoSegmentsHandle& handle, const Segment& segment, bool top) {
     const SequenceRange& place = segment.clipped;
     if (top && place.in <= place.out) {
-        EraseOverlap(mState.mergedMap, place.in, place.out);
-        EraseOverlap(mState.renderMap, place.in, place.out);
+        mMerged.Erase(place.in, place.out);
+        mRendered.Erase(place.in, place.out);
     }
     SegmentInfo info;
     info.in = place.in;
@@ -261,8 +261,8 @@ void SegmentReader::EnterSegment(SegmentInfo& info, bool host, bool ok, bool top
     info.tree = tree;
     // With a node of its own, nested content renders through that and only counts in the statistics.
     const bool isRendered = top || !mState.isRegistered(kKey_NestedTimeline);
-    if (isRendered) ReplaceSegment(mState.renderMap, info);
-    MergeSegment(mState.mergedMap, info);
+    if (isRendered) mRendered.Replace(info);
+    mMerged.Merge(info);
 }
 
 }  // namespace Vantrel

@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-#include "Shared/Src/TimelineState.h"
+#include "Shared/Src/SegmentMap.h"
 #include "Src/VideoNodes/VideoSegmentsHandle.h"
 
 namespace Vantrel {
@@ -27,7 +27,8 @@ struct SequenceTarget {
 /// takes over a tree, or needs a new one. Works under the timeline's lock and calls the host.
 class SegmentReader {
 public:
-    explicit SegmentReader(TimelineState& state) : mState(state) {}
+    explicit SegmentReader(TimelineState& state)
+        : mState(state), mRendered(state.renderMap), mMerged(state.mergedMap) {}
 
     /// Reads a range of a sequence; at the top, nothing when its hash hasn't changed, and nothing of one that is being
     /// read already, which contains itself: what stands for it there renders its default, black.
@@ -59,6 +60,8 @@ private:
                                            bool top);
 
     TimelineState& mState;
+    SegmentCursor mRendered;
+    SegmentCursor mMerged;
 };
 
 }  // namespace Vantrel

@@ -35,10 +35,11 @@ TEST(SegmentMap, MergingAgreesWithACountTickByTick) {
     SCOPED_TRACE(random.GetSeed());
     for (int round = 0; round < 200 && !HasFailure(); ++round) {
         SegmentMap map;
+        SegmentCursor cursor(map);
         Testing::TickModel model(kEnd);
         for (std::uint32_t number = 1; number <= 12; ++number) {
             const SegmentInfo segment = RandomSegment(random, number);
-            MergeSegment(map, segment);
+            cursor.Merge(segment);
             model.Merge(segment);
             model.ExpectEqual([&map](std::int64_t t) { return FindSegment(map, t); });
         }
@@ -47,14 +48,15 @@ TEST(SegmentMap, MergingAgreesWithACountTickByTick) {
 
 TEST(SegmentMap, AnOverlappedStretchIsErasedWholeAndNeighboursStay) {
     SegmentMap map;
+    SegmentCursor cursor(map);
     for (const std::int64_t in : {0, 10, 20, 30}) {
         SegmentInfo info;
         info.in = in;
         info.out = in + 10;
-        ReplaceSegment(map, info);
+        cursor.Replace(info);
     }
     ASSERT_EQ(map.size(), 4U) << "stretches that only touch don't overlap";
-    EraseOverlap(map, 15, 25);
+    cursor.Erase(15, 25);
     EXPECT_EQ(FindSegment(map, 10), nullptr) << "it began before the range";
     EXPECT_EQ(FindSegment(map, 29), nullptr);
     EXPECT_NE(FindSegment(map, 9), nullptr);
@@ -63,10 +65,11 @@ TEST(SegmentMap, AnOverlappedStretchIsErasedWholeAndNeighboursStay) {
     SegmentInfo within;
     within.in = 3;
     within.out = 4;
-    ReplaceSegment(map, within);
+    cursor.Replace(within);
     EXPECT_EQ(FindSegment(map, 2), nullptr) << "the stretch around it is gone";
     EXPECT_EQ(FindSegment(map, 3)->out, 4);
     EXPECT_EQ(FindSegment(map, -1), nullptr);
+    for (std::int64_t t = 40; t >= -1; --t) EXPECT_EQ(cursor.Find(t), FindSegment(map, t)) << t;
 }
 
 }  // namespace
