@@ -212,7 +212,7 @@ bool ShowsUnknown(const Sight& sight, const std::function<std::int64_t(const Sho
 std::size_t Check(const std::string& what, const Document& document, const Film& film,
                   const std::vector<std::int64_t>& frames, const std::function<std::int64_t(const Shown&)>& numberOf) {
     EXPECT_TRUE(film.failures.empty()) << what << ": " << (film.failures.empty() ? "" : film.failures.front());
-    DirectEvaluator evaluator(document, film.frameTicks, Between::kNearest);
+    DirectEvaluator evaluator(document, film.frameTicks);
     std::size_t wrong = 0;
     for (std::size_t i = 0; i < film.pictures.size(); ++i) {
         const std::int64_t frame = frames.empty() ? static_cast<std::int64_t>(i) : frames[i];
@@ -311,7 +311,7 @@ TEST_P(FrameNumbers, OfRandomTimelinesAreThoseOfTheirItems) {
     std::size_t pictures = 0;
     std::size_t faults = 0;
     for (unsigned seed = only ? static_cast<unsigned>(std::stoul(only)) : 1; seed <= timelines && faults < 20; ++seed) {
-        const Json timeline = TimelineMaker(seed, kMediaFrames, Structures::kEvery).Make();
+        const Json timeline = TimelineMaker(seed, kMediaFrames).Make();
         const std::string file = folder.Path("random.otio");
         std::ofstream(file) << timeline.dump();
         if (only) std::cout << timeline.dump(1) << std::endl;

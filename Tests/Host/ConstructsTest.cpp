@@ -119,17 +119,6 @@ TEST(Constructs, MediaTellTheirStream) {
     EXPECT_EQ(snapshot->top->format.width, 1280);
 }
 
-TEST(Constructs, OnlyARemappedClipSaysSo) {
-    const auto key = [](double t, double media) { return Json{{"t", Time(t)}, {"media", Time(media)}}; };
-    const Described described = OneClip(File("x.mov"), Own({{"time_remap", {key(0, 0), key(10, 30)}}}));
-    const Node& clip = LayerOf(described);
-    EXPECT_EQ(Property(clip, "ClipNode::TimeRemapping"), "1");
-    EXPECT_EQ(Property(clip, "ClipNode::ClipSpeed"), "3");
-    EXPECT_EQ(clip.inputs.at(0).offset, 0);
-    EXPECT_EQ(clip.TransformTime(5 * kFrame), 15 * kFrame);
-    EXPECT_EQ(Property(LayerOf(OneClip(File("x.mov"))), "ClipNode::TimeRemapping"), "(fails)");
-}
-
 TEST(Constructs, OperatorsStandInTheOrderOfTheTreeAndStillsKeepThem) {
     const Json fade = {{"keyframes", {{{"t", Time(0)}, {"value", 0}}, {{"t", Time(5)}, {"value", 100}}}}};
     const Described described = OneClip(
@@ -238,42 +227,6 @@ TEST(Constructs, AMatteHasItsOwnMatteButNotThatOfATrackAbove) {
     ASSERT_NE(matteOf(ring->inputs.at(0).node), nullptr);
     EXPECT_EQ(matteOf(matteOf(ring->inputs.at(0).node)), nullptr);
     EXPECT_EQ(matteOf(ring->inputs.at(2).node), nullptr) << "its own";
-}
-
-TEST(Constructs, EffectsOnATrackMakeItANestedSequence) {
-    const Described described(
-        Timeline({Track({Clip("a", 0, 10), Clip("b", 0, 10)}, Effects({Effect("TQ.XQVE Invert")}))}));
-    ASSERT_EQ(described.Segments().size(), 1U);
-    EXPECT_EQ(LayerOf(described).operators.size(), 1U);
-    EXPECT_EQ(std::get<NestedSource>(MediaOf(described).AsMedia()->clip->source).sequence->plain.segments.size(), 2U);
-    // The same of the whole, also when the file is nothing but that stack.
-    for (const bool bare : {false, true}) {
-        Json stack = Stack({Track({Clip("a", 0, 10)})}, Effects({Warp(2.0)}));
-        stack["source_range"] = Range(2, 4);
-        const Described whole(bare ? stack : Json{{"OTIO_SCHEMA", "Timeline.1"}, {"tracks", stack}});
-        EXPECT_EQ(whole.snapshot->top->length, 4 * kFrame);
-        EXPECT_EQ(LayerOf(whole).AsItem()->time.AtItemTime(kFrame).media, 4 * kFrame);
-    }
-}
-
-TEST(Constructs, ASegmentWithARenderedPreviewPlaysIt) {
-    const Json timeline = Timeline({Track({Clip("a", 0, 10), Gap(2)}), Track({Gap(12), Clip("b", 0, 5)})});
-    SnapshotOptions options;
-    options.previews = (std::filesystem::path(testing::TempDir()) / "vantrel-previews").string();
-    std::filesystem::create_directories(options.previews);
-    const std::string file =
-        options.previews + "/" + Described(timeline).Segments().at(1).root->hash.ToString() + ".mov";
-    std::ofstream(file).put('x');
-    FakeProbe probe;
-    probe.infos[file] = FakeProbe::Usual();
-    IdentityBook identities;
-    const SnapshotPtr snapshot = BuildSnapshot(Read(timeline), options, probe, identities);
-    const SegmentList& list = snapshot->top->withPreviews;
-    EXPECT_EQ(list.segments.at(0).root, snapshot->top->plain.segments.at(0).root);
-    EXPECT_EQ(list.segments.at(1).root->kind, NodeKind::kPreview);
-    EXPECT_EQ(list.segments.at(1).offset, 0);
-    EXPECT_EQ(Property(*list.segments.at(1).root, "MediaNode::MediaInstanceString"), file);
-    EXPECT_NE(list.hash, snapshot->top->plain.hash);
 }
 
 TEST(Constructs, HashesChangeWithContentOnly) {

@@ -34,11 +34,6 @@ std::int64_t FrameAt(std::int64_t time, std::int64_t frame) {
         std::floor((static_cast<long double>(time) + 254016.0L) / static_cast<long double>(frame)));
 }
 
-void ListFrames(const Sight& sight, std::vector<Shown>& frames) {
-    if (sight.kind == Sight::Kind::kFrame) frames.push_back(sight.frame);
-    for (const Sight& part : sight.parts) ListFrames(part, frames);
-}
-
 bool IsAdjustment(const Item& item) { return item.kind == ItemKind::kClip && item.media.generator == "adjustment"; }
 
 bool IsRemapped(const Item& item) { return !item.freeze && !item.options.remap.empty(); }
@@ -89,12 +84,6 @@ Sight Sum(std::vector<Sight> parts, std::vector<double> weights) {
 }
 
 }  // namespace
-
-std::vector<Shown> DirectEvaluator::At(std::int64_t time) {
-    std::vector<Shown> frames;
-    ListFrames(SightAt(time), frames);
-    return frames;
-}
 
 Sight DirectEvaluator::SightAt(std::int64_t time) {
     mDoubtful = false;
@@ -256,8 +245,7 @@ Sight DirectEvaluator::ShowContent(const Item& item, std::int64_t length, std::i
     }
     const std::int64_t mediaTime = time - mediaStart;
     if (clip) return ShowMedia(item, mediaTime, speed);
-    const std::int64_t shown =
-        mBetween == Between::kNearest && IsSlowedOrTurned(item) ? NearestFrame(mediaTime, mFrame) : mediaTime;
+    const std::int64_t shown = IsSlowedOrTurned(item) ? NearestFrame(mediaTime, mFrame) : mediaTime;
     if (running && item.speed > 0) return ShowComposition(item, shown);
     // Not forwards: the host shows whole frames of what lies inside.
     const std::int64_t last = std::max<std::int64_t>((LengthOf(item) + mFrame - 1) / mFrame, 1) - 1;
@@ -284,7 +272,7 @@ Sight DirectEvaluator::ShowMedia(const Item& item, std::int64_t mediaTime, doubl
     };
     const bool isStill = last == 0;
     const bool framesDiffer = !isStill && (IsSlowedOrTurned(item) || kMediaFrame != mFrame);
-    if (mBetween == Between::kBegun || !framesDiffer) return frameAt(mediaTime);
+    if (!framesDiffer) return frameAt(mediaTime);
     if (!item.options.frameBlend) return frameAt(NearestFrame(mediaTime, kMediaFrame));
 
     // What a frame of the sequence covers, by shares; less than a frame of the media: between the two around it.

@@ -3,12 +3,19 @@
 #pragma once
 
 #include <cstdint>
+#include <string>
 #include <vector>
 
 #include "Host/Timeline/Model.h"
-#include "Tests/Host/EngineWalk.h"
 
 namespace Vantrel::Host::Test {
+
+/// A media frame in a picture.
+struct Shown {
+    std::string media;
+    std::int64_t mediaTime = 0;
+    std::int64_t frame = 0;
+};
 
 /// What is seen at a moment, as the items say it.
 struct Sight {
@@ -31,19 +38,14 @@ struct Sight {
     double fraction = 0;          ///< kTransition: how much of it has passed
 };
 
-/// Which frame stands at a time between two: the one that has begun, as descriptions number frames; or, where frames
-/// don't map one to one, the nearer one, as pictures are rendered.
-enum class Between { kBegun, kNearest };
-
 /// Says what a document shows at a time by going straight from items to media: no segments, no trees, no offsets. It
 /// expands tracks by itself, in floating point, and shares no code with the description.
 class DirectEvaluator {
 public:
-    DirectEvaluator(const Document& document, std::int64_t frameTicks, Between between = Between::kBegun)
-        : mDocument(document), mFrame(frameTicks), mBetween(between) {}
+    DirectEvaluator(const Document& document, std::int64_t frameTicks) : mDocument(document), mFrame(frameTicks) {}
 
-    [[nodiscard]] std::vector<Shown> At(std::int64_t time);
-    /// The same with its structure.
+    /// Where frames don't map one to one, the frame nearer to a time between two stands at it, as pictures are
+    /// rendered.
     [[nodiscard]] Sight SightAt(std::int64_t time);
     /// Something in the last sight lay so near between two frames that rounding decides.
     [[nodiscard]] bool IsDoubtful() const { return mDoubtful; }
@@ -84,7 +86,6 @@ private:
 
     const Document& mDocument;
     std::int64_t mFrame;
-    Between mBetween;
     bool mDoubtful = false;
 };
 

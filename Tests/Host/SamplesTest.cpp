@@ -8,7 +8,6 @@
 #include <sstream>
 
 #include "Host/Inspect/SegmentsJson.h"
-#include "Tests/Host/EngineWalk.h"
 #include "Tests/Host/TimelineText.h"
 
 /// Files that other programs wrote.
@@ -26,41 +25,6 @@ std::string ReadText(const std::string& path) {
 /// A sample under a name that is the same on every machine: relative references count from it.
 Document ReadSample(const std::string& name) {
     return ReadTimelineText(ReadText(kData + "/otio/" + name + ".otio"), "/samples/" + name + ".otio");
-}
-
-struct Sample {
-    const char* name;
-    std::int64_t length;
-    std::size_t segments;
-};
-constexpr Sample kSamples[] = {{"transition", 19, 5},   {"multiple_track", 19, 6},
-                               {"clip_example", 19, 2}, {"nested_example", 636, 7},
-                               {"big_int", 24, 1},      {"generator_reference_test", 50, 1}};
-
-TEST(Samples, AreDividedIntoTheirSegments) {
-    for (const Sample& sample : kSamples) {
-        const Described described(ReadSample(sample.name));
-        EXPECT_EQ(described.snapshot->top->length, sample.length * kFrame) << sample.name;
-        EXPECT_EQ(described.Segments().size(), sample.segments) << sample.name;
-        EXPECT_EQ(described.snapshot->top->format.frameTicks, kFrame) << sample.name;
-        for (const auto& [id, sequence] : described.snapshot->sequences) {
-            const std::size_t expected = id == 1 ? sample.segments : 1;
-            EXPECT_EQ(sequence->plain.segments.size(), expected) << sample.name << " " << sequence->path;
-        }
-    }
-}
-
-TEST(Samples, AFreezeInsideIsLeftToTheHost) {
-    const Described described(ReadSample("nested_example"));
-    std::size_t nested = 0;
-    std::size_t rendered = 0;
-    for (const Segment& segment : described.Segments()) {
-        const Node& media = *segment.root->inputs.front().node->inputs.front().node;
-        if (!std::holds_alternative<NestedSource>(media.AsMedia()->clip->source)) continue;
-        (media.FindProperty("MediaNode::NestedSequenceTimelineID") != nullptr ? nested : rendered) += 1;
-    }
-    EXPECT_EQ(nested, 2U);
-    EXPECT_EQ(rendered, 1U);
 }
 
 /// JSON in few lines: members share a line while they fit on it.

@@ -117,15 +117,19 @@ TEST(Suites, OpaqueDataStayAsLongAsTheyAreHeld) {
 TEST(Suites, AnswerManyThreadsWhileTimelinesAreReplaced) {
     const Published described(Timeline({Track({Clip("a", 0, 10), Dissolve(2, 2), Clip("b", 5, 10)})}));
     const Described other(Timeline({Track({Clip("a", 3, 10)})}));
+    const auto& memory = Acquire<LarkspurMemoryManagerSuite>(kMemoryManagerSuiteName, kMemoryManagerSuiteVersion);
     std::vector<std::thread> threads;
     for (int t = 0; t < 4; ++t) {
-        threads.emplace_back([] {
+        threads.emplace_back([&memory] {
             for (int i = 0; i < 300; ++i) {
                 const RootHold hold;
                 std::int64_t offset = 0;
                 std::uint32_t input = 0;
                 EXPECT_EQ(Segments().AcquireInputNode(hold.root, 0, &offset, &input), 0);
                 EXPECT_EQ(Segments().TransformTime(input, 5, &offset), 0);
+                char* text = nullptr;
+                EXPECT_EQ(Segments().GetProperty(input, "ClipNode::ClipSpeed", &text), 0);
+                memory.FreeText(text);
                 EXPECT_EQ(Segments().ReleaseNode(input), 0);
                 EXPECT_EQ(Segments().ReleaseNode(hold.root), 0);
                 EXPECT_EQ(Segments().ReleaseVideoSegments(hold.list), 0);
@@ -136,6 +140,7 @@ TEST(Suites, AnswerManyThreadsWhileTimelinesAreReplaced) {
     for (std::thread& thread : threads) thread.join();
     EXPECT_EQ(HostServices::Instance().GetNodes().Count(), 0U);
     EXPECT_EQ(HostServices::Instance().GetSegmentLists().Count(), 0U);
+    EXPECT_EQ(CountTexts(), 0);
 }
 
 }  // namespace

@@ -89,36 +89,5 @@ TEST(TimeMaps, TheAnswerForAnItemLeadsBackToItsTime) {
     }
 }
 
-TEST(TimeMaps, BackwardsEndsWhereForwardsBegins) {
-    TimeMap map;
-    map.motion = Motion::kBackward;
-    map.speed = -1.0;
-    map.in = 10 * kFrame;
-    map.duration = 5 * kFrame;
-    map.frameTicks = kFrame;
-    EXPECT_EQ(map.AtItemTime(0).media, 14 * kFrame);
-    EXPECT_EQ(map.AtItemTime(4 * kFrame).media, 10 * kFrame);
-    EXPECT_EQ(map.MediaOffset(), 0);
-}
-
-TEST(TimeMaps, ARemapFollowsItsCurve) {
-    TimeMap map;
-    map.motion = Motion::kRemap;
-    map.duration = 40 * kFrame;
-    map.curve = {{0, 0, Interpolation::kLinear},
-                 {10 * kFrame, 30 * kFrame, Interpolation::kHold},
-                 {20 * kFrame, 10 * kFrame, Interpolation::kBezier},
-                 {40 * kFrame, 50 * kFrame, Interpolation::kLinear}};
-    EXPECT_EQ(map.Transform(-kFrame), 0);
-    EXPECT_EQ(map.Transform(5 * kFrame), 15 * kFrame);
-    EXPECT_EQ(map.Transform(15 * kFrame), 30 * kFrame);
-    // An ease is symmetrical: half way it is half way, before that behind.
-    EXPECT_NEAR(static_cast<double>(map.Transform(30 * kFrame)), 30.0 * kFrame, 2);
-    EXPECT_LT(map.Transform(25 * kFrame), 20 * kFrame);
-    EXPECT_EQ(map.Transform(100 * kFrame), 50 * kFrame);
-    EXPECT_DOUBLE_EQ(map.ClipSpeed(), 50.0 / 40.0);
-    EXPECT_EQ(map.FromTransformed(map.Transform(5 * kFrame)).media, 15 * kFrame);
-}
-
 }  // namespace
 }  // namespace Vantrel::Host::Test

@@ -8,21 +8,14 @@
 
 namespace Vantrel::Host::Test {
 
-/// Which structures a made timeline may have.
-enum class Structures {
-    kPlain,  ///< cuts, gaps, tracks, trims, speeds, freezes, dissolves and nested compositions
-    kEvery,  ///< besides: every transition, adjustments, angles, generators, stills, curves, blending, effects
-};
-
-/// Makes timelines, the same for the same seed.
+/// Makes timelines of every structure, the same for the same seed.
 class TimelineMaker {
 public:
     /// @param mediaFrames  length of each of the ten films m0.mov to m9.mov.
-    explicit TimelineMaker(unsigned seed, int mediaFrames = 1000, Structures structures = Structures::kPlain)
-        : mRandom(seed), mMediaFrames(mediaFrames), mEvery(structures == Structures::kEvery) {}
+    TimelineMaker(unsigned seed, int mediaFrames) : mRandom(seed), mMediaFrames(mediaFrames) {}
 
     Json Make() {
-        if (mEvery) mOffGrid = Chance(30);
+        mOffGrid = Chance(30);
         std::vector<Json> tracks;
         for (int i = Pick(1, 3); i > 0; --i) tracks.push_back(Chance(85) ? MakeTrack(0, true) : MakeItem(0));
         return Timeline(std::move(tracks));
@@ -39,7 +32,7 @@ private:
         Json clip =
             Clip("clip", Range(in, Pick(1, 9)), File("m" + std::to_string(Pick(0, 9)) + ".mov", start, mMediaFrames));
         if (mOffGrid && Chance(10)) clip["source_range"] = Range(in, Pick(1, 12), 30);
-        if (Sometimes(10)) clip["metadata"]["vantrel"]["frame_blend"] = true;
+        if (Chance(10)) clip["metadata"]["vantrel"]["frame_blend"] = true;
         Dress(clip);
         return clip;
     }
@@ -52,18 +45,18 @@ private:
         if (Chance(5)) item["enabled"] = false;
         Json& own = item["metadata"]["vantrel"];
         if (own.is_null()) own = Json::object();
-        if (Sometimes(30)) own["disabled"] = "node";
+        if (Chance(30)) own["disabled"] = "node";
         const Json range = item.value("source_range", Json());
         const double start = range.is_object() ? range["start_time"]["value"].get<double>() : 0;
         const double rate = range.is_object() ? range["start_time"]["rate"].get<double>() : kRate;
-        if (Sometimes(30)) own["hold"] = {{"t", Time(start + Pick(0, 9), rate)}};
-        if (Sometimes(8)) own["time_remap"] = Curve(start, rate);
+        if (Chance(30)) own["hold"] = {{"t", Time(start + Pick(0, 9), rate)}};
+        if (Chance(8)) own["time_remap"] = Curve(start, rate);
         AddEffects(item);
     }
 
     void AddEffects(Json& item) {
-        if (Sometimes(10)) item["effects"].push_back(Effect("TQ.XQVE Invert"));
-        if (Sometimes(10)) item["effects"].push_back(Effect("TQ.XQVE Opacity", {{"0", 10.0 * Pick(1, 9)}}));
+        if (Chance(10)) item["effects"].push_back(Effect("TQ.XQVE Invert"));
+        if (Chance(10)) item["effects"].push_back(Effect("TQ.XQVE Opacity", {{"0", 10.0 * Pick(1, 9)}}));
     }
 
     Json Curve(double start, double rate) {
@@ -77,16 +70,10 @@ private:
         return keys;
     }
 
-    [[nodiscard]] bool MayLackDevice() const { return !mEvery || !mOffGrid; }
-
-    /// For what only timelines of every structure have.
-    bool Sometimes(int percent) { return mEvery && Chance(percent); }
-
     Json MakeTransition(int in, int out) {
         constexpr const char* kKinds[] = {"SMPTE_Dissolve",    "XQVE Film Dissolve",     "XQVE Dip To Black",
                                           "XQVE Dip To White", "XQVE Additive Dissolve", "XQVE Push"};
         Json transition = Dissolve(in, out);
-        if (!mEvery) return transition;
         transition["transition_type"] = kKinds[Pick(0, 5)];
         if (transition["transition_type"] != "XQVE Push") return transition;
         transition["metadata"]["vantrel"]["properties"] = {{"direction", Pick(1, 4)}, {"reverse", Chance(30)}};
@@ -95,7 +82,7 @@ private:
 
     /// What stands in a clip's place without a film.
     Json MakeSynthetic() {
-        const int kind = MayLackDevice() ? Pick(0, 4) : 2 * Pick(0, 2);
+        const int kind = !mOffGrid ? Pick(0, 4) : 2 * Pick(0, 2);
         if (kind == 0)
             return Clip("still", Range(0, Pick(1, 9)), File("m" + std::to_string(Pick(0, 9)) + ".mov", 0, 1));
         const Json generators[] = {GeneratorOf("adjustment"), GeneratorOf("black"), GeneratorOf("transparent"),
@@ -114,11 +101,11 @@ private:
 
     Json MakeItem(int depth) {
         if (Chance(15)) return Gap(Pick(1, 5));
-        if (Sometimes(20)) return MakeSynthetic();
+        if (Chance(20)) return MakeSynthetic();
         if (depth >= 2 || Chance(65)) return MakeClip();
-        Json nested = Sometimes(25) ? MakeMulticam(depth)
-                      : Chance(50)  ? MakeTrack(depth + 1, false)
-                                    : Stack({MakeTrack(depth + 1, true), MakeTrack(depth + 1, true)});
+        Json nested = Chance(25)   ? MakeMulticam(depth)
+                      : Chance(50) ? MakeTrack(depth + 1, false)
+                                   : Stack({MakeTrack(depth + 1, true), MakeTrack(depth + 1, true)});
         if (Chance(70)) nested["source_range"] = Range(Pick(0, 6), Pick(2, 10));
         Dress(nested);
         return nested;
@@ -127,10 +114,10 @@ private:
     Json MakeTrack(int depth, bool inStack) {
         std::vector<Json> children;
         for (int i = Pick(1, 4); i > 0; --i) {
-            if (MayLackDevice() && Chance(20)) children.push_back(MakeTransition(Pick(0, 4), Pick(0, 4)));
+            if (!mOffGrid && Chance(20)) children.push_back(MakeTransition(Pick(0, 4), Pick(0, 4)));
             children.push_back(MakeItem(depth));
         }
-        if (MayLackDevice() && Chance(10)) children.push_back(MakeTransition(Pick(0, 3), Pick(0, 3)));
+        if (!mOffGrid && Chance(10)) children.push_back(MakeTransition(Pick(0, 3), Pick(0, 3)));
         Json track = Track(std::move(children));
         if (inStack && Chance(20)) track["source_range"] = Range(Pick(-6, 6), Pick(4, 16));
         if (inStack && Chance(5)) track["effects"] = {Warp(1.5)};
@@ -139,10 +126,9 @@ private:
 
     std::mt19937 mRandom;
     int mMediaFrames;
-    bool mEvery;
     /// Items may begin and end between two frames. What the host renders for the device it renders at whole frames of
     /// the content, so timelines of every structure then have none of those that a device may lack.
-    bool mOffGrid = true;
+    bool mOffGrid = false;
 };
 
 }  // namespace Vantrel::Host::Test

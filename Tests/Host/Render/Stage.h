@@ -66,6 +66,12 @@ public:
         description.quality = quality;
         return description;
     }
+    /// One for bytes, which the first of its two formats doesn't give.
+    [[nodiscard]] VantrelRenderDescription DescribeBytes(int width, int height) const {
+        VantrelRenderDescription description = Describe(width, height);
+        description.pixelFormats = mByteFormats;
+        return description;
+    }
     [[nodiscard]] Host::SequenceSize GetSize() const {
         const Host::SequenceFormat& format = GetSequence().format;
         return {format.width, format.height, {format.aspectNumerator, format.aspectDenominator}, format.frameTicks};
@@ -83,14 +89,6 @@ public:
         return Host::Software::ReadPicture(picture->pixels.get(), picture->rowBytes, picture->width, picture->height,
                                            picture->format, picture->alphaType);
     }
-    /// Which numbered frame a frame of the sequence shows; -1 for a mix.
-    [[nodiscard]] std::int64_t NumberAt(int frame) {
-        const Host::SequenceFormat& format = GetSequence().format;
-        VantrelRenderDescription description = Describe(format.width, format.height);
-        const std::uint32_t bytes[] = {Vellum::FourCC("bgra"), 0};
-        description.pixelFormats = bytes;
-        return Host::ReadNumber(*RenderHost(frame, description));
-    }
 
 private:
     Host::FFmpegProbe mProbe;
@@ -100,6 +98,7 @@ private:
     std::shared_ptr<Host::PixelBufferPool> mPool;
     std::unique_ptr<Host::ISoftwareRenderer> mRenderer;
     std::uint32_t mFormats[2] = {Vellum::FourCC("bgrf"), 0};
+    std::uint32_t mByteFormats[2] = {Vellum::FourCC("VUYA"), Vellum::FourCC("bgra")};
 };
 
 /// Expects a pixel, given as red, green, blue, alpha.

@@ -1,5 +1,6 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
+#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 #include <algorithm>
@@ -93,16 +94,15 @@ TEST(Titles, ScaleWithSizeLinesAndPixelAspect) {
 }
 
 TEST(Titles, FindTheirFonts) {
-    const auto endsWith = [](const std::string& path, const std::string& name) {
-        return path.size() > name.size() && path.compare(path.size() - name.size(), name.size(), name) == 0;
-    };
-    EXPECT_TRUE(endsWith(Host::Software::FindFontFile(""), "/LiberationSans-Regular.ttf"));
-    EXPECT_TRUE(endsWith(Host::Software::FindFontFile("Arial Bold"), "/LiberationSans-Bold.ttf"));
-    EXPECT_TRUE(endsWith(Host::Software::FindFontFile("Times New Roman"), "/LiberationSerif-Regular.ttf"));
-    EXPECT_TRUE(
-        endsWith(Host::Software::FindFontFile("Liberation Mono Bold Italic"), "/LiberationMono-BoldItalic.ttf"));
-    EXPECT_TRUE(endsWith(Host::Software::FindFontFile("sans-serif"), "/LiberationSans-Regular.ttf"));
-    EXPECT_TRUE(endsWith(Host::Software::FindFontFile("No Such Family"), "/LiberationSans-Regular.ttf"));
+    const std::pair<const char*, const char*> fonts[] = {{"", "Sans-Regular"},
+                                                         {"Arial Bold", "Sans-Bold"},
+                                                         {"Times New Roman", "Serif-Regular"},
+                                                         {"Liberation Mono Bold Italic", "Mono-BoldItalic"},
+                                                         {"sans-serif", "Sans-Regular"},
+                                                         {"No Such Family", "Sans-Regular"}};
+    for (const auto& [name, file] : fonts) {
+        EXPECT_THAT(Host::Software::FindFontFile(name), testing::EndsWith(std::string("/Liberation") + file + ".ttf"));
+    }
 }
 
 TEST(Titles, WhatLiesOutsideIsCutOff) {
