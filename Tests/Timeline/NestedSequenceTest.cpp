@@ -40,23 +40,6 @@ TEST_F(NestedSequence, ItsTreesGoToItsNodeAndItsWorkIsCounted) {
     EXPECT_EQ(node.segmentTrees[1].end, 800);
 }
 
-TEST_F(NestedSequence, ItsStacksAddUpAsNestedLayers) {
-    AddNode(30, "Compositor", {11, 12, 12});
-    host.sequences[kInner].segments = {{0, 300, 0, NumberedGuid(30), 30}};
-    const SegmentInfo info = Build(10);
-    EXPECT_EQ(info.layerCount, 0);
-    EXPECT_EQ(info.nestedLayerCount, 5) << "1 + 3 of the segment, and 1 of the media";
-}
-
-TEST_F(NestedSequence, TheStatisticsTellItsMomentsApartAndTheRenderingDoesNot) {
-    Build(10);
-    EXPECT_EQ(InfoAt(500).in, 0);
-    EXPECT_EQ(InfoAt(100, true).effectCount, 2);
-    EXPECT_EQ(InfoAt(100, true).out, 300);
-    EXPECT_EQ(InfoAt(500, true).effectCount, 0);
-    EXPECT_EQ(InfoAt(900, true).in, 800) << "the inner sequence's gap";
-}
-
 TEST_F(NestedSequence, ItsRangeFollowsOffsetAndSpeed) {
     host.sequences[kTop].segments.clear();
     AddSegment(kTop, 100, 300, 10, 50);
@@ -129,21 +112,6 @@ TEST_F(NestedSequence, WhenItCannotBeReadItsSegmentHasNoEntry) {
     EXPECT_EQ(timeline->GetSegmentInfo(500, info, false), 11);
     EXPECT_EQ(timeline->GetSegmentInfo(500, info, true), 11);
     EXPECT_EQ(InfoAt(1500).guid, NumberedGuid(13)) << "the walk over the others goes on";
-}
-
-TEST_F(NestedSequence, ANestedHostSegmentTakesAccelerationAwayFromItsMoment) {
-    needHost.insert("Blur");
-    Build(10);
-    EXPECT_FALSE(InfoAt(100, true).accelerated);
-    EXPECT_TRUE(InfoAt(100, true).hostPart);
-    EXPECT_TRUE(InfoAt(500, true).accelerated);
-}
-
-TEST_F(NestedSequence, AMulticamTracksSequenceServesWhenThereIsNoOther) {
-    host.nodes[510].properties.erase("MediaNode::NestedSequenceTimelineID");
-    host.nodes[510].properties["MediaNode::SelectedMulticamTrackTimelineID"] = std::to_string(kInner);
-    host.nodes[510].properties["MediaNode::SelectedMulticamTrack"] = "7";
-    EXPECT_EQ(Probe(Build(10).tree).segmentTrees.size(), 2U);
 }
 
 TEST_F(NestedSequence, OneThatContainsItselfIsBlackThere) {

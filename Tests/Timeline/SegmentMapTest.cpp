@@ -46,31 +46,5 @@ TEST(SegmentMap, MergingAgreesWithACountTickByTick) {
     }
 }
 
-TEST(SegmentMap, AnOverlappedStretchIsErasedWholeAndNeighboursStay) {
-    SegmentMap map;
-    SegmentCursor cursor(map);
-    for (const std::int64_t in : {0, 10, 20, 30}) {
-        SegmentInfo info;
-        info.in = in;
-        info.out = in + 10;
-        cursor.Replace(info);
-    }
-    ASSERT_EQ(map.size(), 4U) << "stretches that only touch don't overlap";
-    cursor.Erase(15, 25);
-    EXPECT_EQ(FindSegment(map, 10), nullptr) << "it began before the range";
-    EXPECT_EQ(FindSegment(map, 29), nullptr);
-    EXPECT_NE(FindSegment(map, 9), nullptr);
-    EXPECT_NE(FindSegment(map, 30), nullptr);
-
-    SegmentInfo within;
-    within.in = 3;
-    within.out = 4;
-    cursor.Replace(within);
-    EXPECT_EQ(FindSegment(map, 2), nullptr) << "the stretch around it is gone";
-    EXPECT_EQ(FindSegment(map, 3)->out, 4);
-    EXPECT_EQ(FindSegment(map, -1), nullptr);
-    for (std::int64_t t = 40; t >= -1; --t) EXPECT_EQ(cursor.Find(t), FindSegment(map, t)) << t;
-}
-
 }  // namespace
 }  // namespace Vantrel

@@ -13,10 +13,10 @@ namespace Vantrel::Testing {
 
 /// What becomes of the keys that a timeline asks its creator for. A key in no set gives a device's node.
 struct CreatorScript {
-    std::set<std::string> unregistered;  ///< come back as a host subtree
-    std::set<std::string> failing;       ///< registered, but can't be configured: a host subtree as well
-    std::set<std::string> refused;       ///< nothing comes back
-    std::set<std::string> needHost;      ///< nodes that say of themselves that they render through the host
+    std::set<std::string> unregistered{};  ///< come back as a host subtree
+    std::set<std::string> failing{};       ///< registered, but can't be configured: a host subtree as well
+    std::set<std::string> refused{};       ///< nothing comes back
+    std::set<std::string> needHost{};      ///< nodes that say of themselves that they render through the host
 };
 
 /// Counts by itself what a script costs: which segments are seen, what each holds, who renders it. It walks the host's
