@@ -88,19 +88,6 @@ TEST_P(CompositorDevice, TheBottomLayerHasNoBlendModeAndThenNoOpacity) {
     ExpectPixel(PixelOf(Render(*Composite({Layer(leaf)})), 5, 5), {0.0, 0.0, 1.0, 0.3});
 }
 
-TEST_P(CompositorDevice, LayersAreDrawnFromTheBottomUp) {
-    const FrameLeafRef small = Leaf(kBlue, 16, 12);
-    small->frame->SetOrigin({-24, -12});  // as media is centred
-    const auto compositor = Composite({Leaf(kRed), Layer(Leaf(kHalfGreen)), Layer(small)});
-    SetOpacity({{0, 50.0F}});
-    const Picture picture = Download(Render(*compositor));
-    // A quarter of green over red.
-    ExpectPixel(picture.Get(2, 2), {0.0, 0.25, 0.75, 1.0});
-    // Half of blue over that, where the small layer lies: around the centre.
-    ExpectPixel(picture.Get(32, 18), {0.5, 0.125, 0.375, 1.0});
-    ExpectPixel(picture.Get(22, 18), {0.0, 0.25, 0.75, 1.0});
-}
-
 TEST_P(CompositorDevice, WhatNoLayerCoversIsTransparent) {
     const auto corner = [this](const Params& motion, int width = 64, int height = 36) {
         script.ResetEffects();

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/MediaNode.h"
@@ -17,22 +17,19 @@
 namespace Vantrel::Testing {
 namespace {
 
-using ::testing::ElementsAre;
 using Upload = ProxyNode<UploadNode, SWHostRenderClipPrefetch>;
 using ClipMedia = ProxyNode<MediaNode, Upload>;
 
 class MediaChain : public HostedTest {
 protected:
     InterfaceRef<ClipMedia> MakeMedia() { return script.Make<ClipMedia>(MediaScript::Media(), device); }
-    /// The names below the media node, down to the producer.
-    std::vector<std::string> Chain(const MediaScript::Properties& properties) {
-        script.Set(properties);
-        std::vector<std::string> names;
+    /// The names of the sources between the media node and its upload.
+    std::string Sources() {
+        std::string names;
         const auto media = MakeMedia();
-        if (!media) return {"none"};
         for (auto node = Ostrand::Query<FilterNode>(media->GetInput(0)); node;
              node = Ostrand::Query<FilterNode>(node->GetInput(0))) {
-            names.push_back(Halden::ToUTF8(node->GetName()));
+            if (node->GetName() != u"Upload Node") names += Halden::ToUTF8(node->GetName()) + " ";
         }
         return names;
     }
@@ -48,53 +45,54 @@ protected:
 };
 
 TEST_F(MediaChain, HasOnlyTheSourcesThatTheMediaNeeds) {
-    EXPECT_THAT(Chain({}), ElementsAre("ScaleSource", "Upload Node"));
-    EXPECT_THAT(Chain({{"MediaNode::ClipSpeed", "0.5"}}),
-                ElementsAre("TimeSampleSource", "ScaleSource", "Upload Node"));
-    EXPECT_THAT(Chain({{"MediaNode::ClipSpeed", "1"}, {"MediaNode::ClipBackwards", "1"}}),
-                ElementsAre("TimeSampleSource", "ScaleSource", "Upload Node"));
-    EXPECT_THAT(Chain({{"MediaNode::ClipBackwards", "0"}, {"MediaNode::StreamFrameRate", "400"}}),
-                ElementsAre("TimeSampleSource", "ScaleSource", "Upload Node"));
-    host.nodes[MediaScript::kClip].properties["ClipNode::TimeRemapping"] = "x";
-    EXPECT_THAT(Chain({{"MediaNode::StreamFrameRate", "1000"}}),
-                ElementsAre("TimeSampleSource", "ScaleSource", "Upload Node"));
-    host.nodes[MediaScript::kMedia].flags = kNodeFlag_Still;
-    EXPECT_THAT(Chain({{"MediaNode::InterlaceConsecutiveFrames", "1"}, {"MediaNode::StreamFrameBlend", "1"}}),
-                ElementsAre("ScaleSource", "Upload Node"))
-        << "a still has no time";
-    EXPECT_THAT(Chain({{"MediaNode::StreamInvertAlpha", "1"}}),
-                ElementsAre("ScaleSource", "InvertAlphaSource", "Upload Node"));
-    EXPECT_THAT(Chain({{"MediaNode::StreamIgnoreAlpha", "1"}}), ElementsAre("ScaleSource", "Upload Node"));
-    EXPECT_THAT(Chain({{"MediaNode::RemoveFlicker", "1"}}),
-                ElementsAre("ScaleSource", "RemoveFlickerSource", "Upload Node"));
-}
-
-TEST_F(MediaChain, BringsFieldsIntoTheSequencesOrder) {
-    script.params.fieldType = 2;
-    EXPECT_THAT(Chain({{"MediaNode::StreamFieldType", "1"}}),
-                ElementsAre("ScaleSource", "FieldReverseSource", "Upload Node"));
-    EXPECT_THAT(Chain({{"MediaNode::StreamReverseFieldDominance", "1"}}),
-                ElementsAre("ScaleSource", "ReverseFieldDominanceSource", "Upload Node"));
-    EXPECT_THAT(Chain({{"MediaNode::ClipBackwards", "1"}}),
-                ElementsAre("TimeSampleSource", "ScaleSource", "FieldReverseSource", "Upload Node"))
-        << "backwards and reversed cancel each other";
-    EXPECT_THAT(Chain({{"MediaNode::ClipBackwards", "0"},
-                       {"MediaNode::StreamReverseFieldDominance", "0"},
-                       {"MediaNode::ClipScaleToFramePolicy", "1"},
-                       {"MediaNode::StreamFrameHeight", "72"}}),
-                ElementsAre("ScaleSource", "Upload Node"))
-        << "a reduced picture is resampled anyway";
-    EXPECT_THAT(
-        Chain({{"MediaNode::ClipScaleToFramePolicy", "0"}, {"MediaNode::DeinterlaceAlways", "1"}}),
-        ElementsAre("TimeSampleSource", "ScaleSource", "DeinterlaceSource", "FieldReverseSource", "Upload Node"));
-    EXPECT_THAT(Chain({{"MediaNode::StreamRemovePulldown", "1"}, {"MediaNode::StreamPullDownCadence", "1"}}),
-                ElementsAre("TimeSampleSource", "ScaleSource", "Upload Node"));
+    const struct {
+        MediaScript::Properties media;
+        const char* sources;
+        std::uint32_t fieldType = 0;  ///< of the sequence
+    } kRows[] = {
+        {{}, "ScaleSource "},
+        {{{"ClipSpeed", "0.5"}}, "TimeSampleSource ScaleSource "},
+        {{{"ClipBackwards", "1"}}, "TimeSampleSource ScaleSource "},
+        {{{"StreamFrameRate", "400"}}, "TimeSampleSource ScaleSource "},
+        {{{"StreamInvertAlpha", "1"}}, "ScaleSource InvertAlphaSource "},
+        {{{"StreamInvertAlpha", "1"}, {"StreamIgnoreAlpha", "1"}}, "ScaleSource "},
+        {{{"RemoveFlicker", "1"}}, "ScaleSource RemoveFlickerSource "},
+        {{{"StreamFieldType", "1"}}, "ScaleSource FieldReverseSource ", 2},
+        {{{"StreamFieldType", "1"}, {"StreamReverseFieldDominance", "1"}},
+         "ScaleSource ReverseFieldDominanceSource ",
+         2},
+        // Backwards and reversed cancel each other.
+        {{{"StreamFieldType", "1"}, {"StreamReverseFieldDominance", "1"}, {"ClipBackwards", "1"}},
+         "TimeSampleSource ScaleSource FieldReverseSource ",
+         2},
+        // A reduced picture is resampled anyway.
+        {{{"StreamFieldType", "1"}, {"ClipScaleToFramePolicy", "1"}, {"StreamFrameHeight", "72"}}, "ScaleSource ", 2},
+        {{{"StreamFieldType", "1"}, {"DeinterlaceAlways", "1"}},
+         "TimeSampleSource ScaleSource DeinterlaceSource FieldReverseSource ",
+         2},
+        {{{"StreamFieldType", "1"},
+          {"DeinterlaceAlways", "1"},
+          {"StreamRemovePulldown", "1"},
+          {"StreamPullDownCadence", "1"}},
+         "TimeSampleSource ScaleSource ",
+         2},
+        // Two fields merge into a frame.
+        {{{"StreamFieldType", "1"}, {"StreamFrameBlend", "1"}}, "TimeSampleSource ScaleSource "},
+    };
+    const auto usual = host.nodes[MediaScript::kMedia].properties;
+    for (const auto& row : kRows) {
+        host.nodes[MediaScript::kMedia].properties = usual;
+        for (const auto& [key, value] : row.media) script.Set({{"MediaNode::" + key, value}});
+        script.params.fieldType = row.fieldType;
+        EXPECT_EQ(Sources(), row.sources) << ::testing::PrintToString(row.media);
+    }
+    host.nodes[MediaScript::kMedia].properties = usual;
     script.params.fieldType = 0;
-    EXPECT_THAT(Chain({{"MediaNode::StreamRemovePulldown", "0"},
-                       {"MediaNode::DeinterlaceAlways", "0"},
-                       {"MediaNode::StreamFrameBlend", "1"}}),
-                ElementsAre("TimeSampleSource", "ScaleSource", "Upload Node"))
-        << "two fields merge into a frame";
+    host.nodes[MediaScript::kClip].properties["ClipNode::TimeRemapping"] = "x";
+    EXPECT_EQ(Sources(), "TimeSampleSource ScaleSource ");
+    host.nodes[MediaScript::kMedia].flags = kNodeFlag_Still;
+    script.Set({{"MediaNode::InterlaceConsecutiveFrames", "1"}, {"MediaNode::StreamFrameBlend", "1"}});
+    EXPECT_EQ(Sources(), "ScaleSource ") << "a still has no time";
 }
 
 TEST_F(MediaChain, RefusesWhatIsntMediaOrDoesntFit) {
@@ -237,32 +235,29 @@ TEST_F(MediaChain, TheUploadsFingerprintTellsPicturesApart) {
 
 TEST_F(MediaChain, FieldSourcesMoveTheRequest) {
     const auto reverse = script.Make<ReverseFieldDominanceSource>(MediaScript::Media(), device);
-    script.params.clipTime = 2300;
-    script.params.fieldSelection = 0;
-    RenderParams out;
-    reverse->TransformParams(out, script.params);
-    EXPECT_EQ(out.fieldSelection, 1U);
-    EXPECT_EQ(out.clipTime, 2500);
-    EXPECT_EQ(out.time, 500);
-    script.params.fieldSelection = 1;
-    reverse->TransformParams(out, script.params);
-    EXPECT_EQ(out.fieldSelection, 0U);
-    EXPECT_EQ(out.clipTime, 2000);
-    script.params.fieldSelection = 2;
-    reverse->TransformParams(out, script.params);
-    EXPECT_EQ(out.fieldSelection, 2U);
-
     const auto interlace = script.Make<InterlaceConsecutiveFramesSource>(MediaScript::Media(), device);
     interlace->SetInput(0, {});
-    script.params.clipTime = 10;
-    script.params.fieldSelection = 0;
-    interlace->TransformParams(out, script.params);
-    EXPECT_EQ(out.clipTime, 20);
-    EXPECT_EQ(out.fieldSelection, 0U);
-    script.params.clipTime = 250;
-    interlace->TransformParams(out, script.params);
-    EXPECT_EQ(out.fieldSelection, 1U) << "500 lies in the second half frame";
     EXPECT_EQ(interlace->GetFrameRate().GetTicksPerFrame(), 500);
+    const struct {
+        TransformRenderParamsBaseNode& source;
+        std::int64_t clipTime;
+        std::uint32_t selection;
+        std::int64_t outTime, outClipTime;
+        std::uint32_t outSelection;
+    } kRows[] = {{*reverse, 2300, 0, 500, 2500, 1},
+                 {*reverse, 2300, 1, 0, 2000, 0},
+                 {*reverse, 2300, 2, 0, 2000, 2},
+                 {*interlace, 10, 0, 0, 20, 0},
+                 {*interlace, 250, 0, 0, 500, 1}};  // 500 lies in the second half frame
+    for (const auto& row : kRows) {
+        script.params.clipTime = row.clipTime;
+        script.params.fieldSelection = row.selection;
+        RenderParams out;
+        row.source.TransformParams(out, script.params);
+        EXPECT_EQ(out.time, row.outTime) << row.clipTime;
+        EXPECT_EQ(out.clipTime, row.outClipTime) << row.clipTime;
+        EXPECT_EQ(out.fieldSelection, row.outSelection) << row.clipTime;
+    }
 }
 
 /// The times and weights that a time source asks for, as "frame: time*weight@field ...".
@@ -285,46 +280,49 @@ protected:
     }
 };
 
-TEST_F(TimeSamples, WithoutBlendingTheNearestFrameIsShown) {
-    script.Set({{"MediaNode::StreamFrameRate", "1250"}, {"MediaNode::ContentStart", "12500"}});
-    script.params.clipTime = 1000;
-    EXPECT_EQ(Ask(), "13750: 13750*1@0; ");
-    script.params.clipTime = 3000;
-    EXPECT_EQ(Ask(), "15000: 15000*1@0; ") << "3000 lies nearer to 2500";
-    script.Set({{"MediaNode::StreamFrameBlend", "1"}});
-    script.params.quality = 1;
-    EXPECT_EQ(Ask(), "15000: 15000*1@0; ");
-}
-
-TEST_F(TimeSamples, BlendingSharesByClosenessOrByDuration) {
-    script.Set({{"MediaNode::StreamFrameRate", "1250"}, {"MediaNode::StreamFrameBlend", "1"}});
-    script.params.clipTime = 1000;
-    EXPECT_EQ(Ask(), "0: 0*0.2@0; 1250: 1250*0.8@0; ") << "slower than the sequence: the two around the moment";
-    script.params.clipTime = 2500;
-    EXPECT_EQ(Ask(), "2500: 2500*1@0; ");
-
-    script.Set({{"MediaNode::StreamFrameRate", "400"}});
-    script.params.clipTime = 1000;
-    EXPECT_EQ(Ask(), "800: 800*0.2@0; 1200: 1200*0.4@0; 1600: 1600*0.4@0; ") << "faster: all that it lasts";
-    script.Set({{"MediaNode::StreamFrameRate", "1000"}, {"MediaNode::ClipSpeed", "2"}});
-    EXPECT_EQ(Ask(), "1000: 1000*0.5@0; 2000: 2000*0.5@0; ");
-    script.Set({{"MediaNode::ClipSpeed", "1"}, {"MediaNode::StreamFieldType", "1"}});
-    EXPECT_EQ(Ask(), "1000: 1000*0.5@0 1500*0.5@0; ") << "two fields make a frame";
-}
-
-TEST_F(TimeSamples, FieldsOfTheSequenceAreMomentsOfTheirOwn) {
-    script.params.sequenceFieldType = 2;
-    script.params.clipTime = 3000;
-    script.Set({{"MediaNode::StreamFrameRate", "500"}});
-    EXPECT_EQ(Ask(), "3000: 3000*1@2; 3500: 3500*1@1; ") << "the lower field comes first";
-    script.Set({{"MediaNode::StreamFrameRate", "1500"}});
-    EXPECT_EQ(Ask(), "3000: 3000*1@0; ") << "both show the same frame";
-    script.Set({{"MediaNode::StreamFrameRate", "500"}});
-    script.params.fieldSelection = 0;
-    EXPECT_EQ(Ask(), "3000: 3000*1@0; ");
-    script.params.fieldSelection = 1;
-    script.params.clipTime = 3500;
-    EXPECT_EQ(Ask(), "3500: 3500*1@0; ") << "the request has moved by a field already";
+TEST_F(TimeSamples, FollowRatesBlendingAndFields) {
+    const struct {
+        const char* what;
+        const char* rate;  ///< of the stream, whose sequence has 1000 ticks a frame
+        const char* blend;
+        std::int64_t clipTime;
+        std::string samples;
+        std::uint32_t quality = 2, sequenceField = 0, selection = Vellum::kFieldSelection_Frame;
+        MediaScript::Properties more = {};
+    } kRows[] = {
+        {"the nearest frame", "1250", "0", 1000, "1250: 1250*1@0; "},
+        {"3000 lies nearer to 2500", "1250", "0", 3000, "2500: 2500*1@0; "},
+        {"drafts aren't blended", "1250", "1", 3000, "2500: 2500*1@0; ", 1},
+        {"from the content's start", "1250", "0", 1000, "13750: 13750*1@0; ", 2, 0, 2, {{"ContentStart", "12500"}}},
+        {"slower: the two around the moment", "1250", "1", 1000, "0: 0*0.2@0; 1250: 1250*0.8@0; "},
+        {"on a frame", "1250", "1", 2500, "2500: 2500*1@0; "},
+        {"faster: all that it lasts", "400", "1", 1000, "800: 800*0.2@0; 1200: 1200*0.4@0; 1600: 1600*0.4@0; "},
+        {"twice as fast", "1000", "1", 1000, "1000: 1000*0.5@0; 2000: 2000*0.5@0; ", 2, 0, 2, {{"ClipSpeed", "2"}}},
+        {"two fields make a frame",
+         "1000",
+         "1",
+         1000,
+         "1000: 1000*0.5@0 1500*0.5@0; ",
+         2,
+         0,
+         2,
+         {{"StreamFieldType", "1"}}},
+        {"the lower field comes first", "500", "0", 3000, "3000: 3000*1@2; 3500: 3500*1@1; ", 2, 2},
+        {"both fields show the same frame", "1500", "0", 3000, "3000: 3000*1@0; ", 2, 2},
+        {"the first field alone", "500", "0", 3000, "3000: 3000*1@0; ", 2, 2, 0},
+        {"the second, whose request has moved already", "500", "0", 3500, "3500: 3500*1@0; ", 2, 2, 1},
+    };
+    const auto usual = host.nodes[MediaScript::kMedia].properties;
+    for (const auto& row : kRows) {
+        host.nodes[MediaScript::kMedia].properties = usual;
+        script.Set({{"MediaNode::StreamFrameRate", row.rate}, {"MediaNode::StreamFrameBlend", row.blend}});
+        for (const auto& [key, value] : row.more) script.Set({{"MediaNode::" + key, value}});
+        script.params.clipTime = row.clipTime;
+        script.params.quality = row.quality;
+        script.params.sequenceFieldType = row.sequenceField;
+        script.params.fieldSelection = row.selection;
+        EXPECT_EQ(Ask(), row.samples) << row.what;
+    }
 }
 
 }  // namespace
