@@ -3,10 +3,8 @@
 #include <gmock/gmock.h>
 
 #include "Src/Nodes/MultipleTimeInputBaseNode.h"
-#include "Src/Nodes/ProxyNode.h"
 #include "Src/Nodes/SelectInputBaseNode.h"
 #include "Src/Nodes/SourceBaseNode.h"
-#include "Src/Nodes/TransformIndividualInputRenderParamsBaseNode.h"
 #include "Src/Nodes/TransformRenderParamsBaseNode.h"
 #include "Tests/Nodes/ProbeNodes.h"
 #include "Tests/Support/HostedTest.h"
@@ -57,32 +55,6 @@ TEST(TransformRenderParams, EveryPhaseAndTheFingerprintSeeTheTransformedParams) 
     EXPECT_EQ(stage.log.size(), 7U);
     EXPECT_EQ(leaf->lastParams.clipTime, 200);
     EXPECT_FALSE(stage.results->FindFrame(HashOf(1)));
-}
-
-class Spread final : public Concrete<TransformIndividualInputRenderParamsBaseNode> {
-public:
-    void TransformParamsForInput(RenderParams& out, const RenderParams& params, std::size_t index) override {
-        out.time = params.time + static_cast<std::int64_t>(index);
-    }
-};
-
-TEST(TransformIndividualInputRenderParams, EachInputHasItsOwnParams) {
-    ProbeStage stage;
-    const auto node = stage.Configured(InterfaceRef<Spread>(new Spread));
-    const ProbeLeafRef first = stage.Leaf("first");
-    const ProbeLeafRef last = stage.Leaf("last");
-    node->SetInput(0, first);
-    node->SetInput(2, last);
-    stage.params.time = 10;
-    EXPECT_EQ(node->RequestHostFrames(stage.params, stage.results), 0);
-    EXPECT_EQ(first->lastParams.time, 10);
-    EXPECT_EQ(last->lastParams.time, 12);
-    stage.TakeLog();
-    first->status = Ostrand::kStatus_Failure;
-    VideoFrameRef frame;
-    EXPECT_EQ(stage.Render(*node, frame), Ostrand::kStatus_Failure);
-    EXPECT_EQ(node->EndFrame({}, stage.params, stage.results, 3), 0);
-    EXPECT_THAT(stage.log, ElementsAre("first RenderFrame", "first EndFrame 3", "last EndFrame 3"));
 }
 
 class Chooser final : public SelectInputBaseNode, public Ostrand::Allocated<Chooser> {
@@ -210,47 +182,6 @@ TEST_F(SourceChainTest, RatesComeFromTheLastLinkWhichReadsTheMedia) {
         const auto asSource = Ostrand::Query<ISourceNode>(RenderNodeRef(head));
         EXPECT_EQ(Ostrand::Query<IRenderNode>(asSource).Get(), static_cast<IRenderNode*>(head.Get()));
     }
-}
-
-class InnerNode final : public Concrete<FilterNode> {
-public:
-    Status Configure(const VideoNodeRef& description, const RenderRequirements& requirements, bool& host) override {
-        if (requirements.frameTicks == 0) return Ostrand::kStatus_Failure;
-        return FilterNode::Configure(description, requirements, host);
-    }
-};
-
-class OuterNode : public FilterNode {
-public:
-    OuterNode() : FilterNode(false, false) {}
-    Status Configure(const VideoNodeRef& description, const RenderRequirements& requirements, bool& host) override {
-        configured = true;
-        return FilterNode::Configure(description, requirements, host);
-    }
-    Status Render(const RenderToken&, const RenderParams&, const RenderResultsRef&) override { return 0; }
-    bool configured = false;
-};
-
-TEST(ProxyNode, ConfiguresTheInnerNodeFirstAndHandsInputsDown) {
-    ProbeStage stage;
-    using Proxy = ProxyNode<OuterNode, InnerNode>;
-    const InterfaceRef<Proxy> failing(new Proxy);
-    EXPECT_THROW(failing->SetInput(0, stage.Leaf("early")), Ostrand::NullInterfaceException);
-    RenderRequirements requirements = stage.Requirements();
-    requirements.frameTicks = 0;
-    bool host = false;
-    EXPECT_EQ(failing->Configure({}, requirements, host), Ostrand::kStatus_Failure);
-    EXPECT_FALSE(failing->configured);
-    EXPECT_FALSE(failing->GetInput(0));
-
-    const auto proxy = stage.Configured(InterfaceRef<Proxy>(new Proxy));
-    const ProbeLeafRef leaf = stage.Leaf("leaf");
-    proxy->SetInput(0, leaf);
-    const auto inner = Ostrand::Query<FilterNode>(proxy->GetInput(0));
-    ASSERT_TRUE(inner);
-    EXPECT_EQ(inner->GetInput(0), RenderNodeRef(leaf));
-    EXPECT_EQ(proxy->GetInputCount(), 1U);
-    EXPECT_TRUE(Ostrand::Query<FilterNode>(proxy));
 }
 
 }  // namespace

@@ -50,17 +50,5 @@ TEST_F(SuiteHolderTest, AFailedAcquisitionIsKeptAndLeavesItsUserEmpty) {
     ReleaseSuites();
 }
 
-TEST_F(SuiteHolderTest, TheFirstRecordStaysUntilTheLastRelease) {
-    QuillBasicSuite other{};
-    SetBasicSuite(host.GetBasicSuite());
-    SetBasicSuite(&other);  // without entries: calling it would crash
-    EXPECT_NE(FindOpaqueEffectDataSuite(), nullptr);
-    ReleaseSuites();
-    EXPECT_NE(FindMemoryManagerSuite(), nullptr) << "one count is left";
-    EXPECT_EQ(host.Count("ReleaseSuite"), 0);
-    ReleaseSuites();
-    EXPECT_EQ(FindMemoryManagerSuite(), nullptr) << "users forget their pointers with the holder";
-}
-
 }  // namespace
 }  // namespace Vantrel::Testing
