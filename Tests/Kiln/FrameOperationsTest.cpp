@@ -104,30 +104,6 @@ TEST_P(FrameOperationsOnEachDevice, ScaleMatchesTheReference) {
     }
 }
 
-TEST_P(FrameOperationsOnEachDevice, ScaleKeepsFlatColourFlatAndTheMeanOfAPattern) {
-    // Single-pixel stripes reduced by more than two: what is left is their mean, not a new pattern.
-    Picture stripes(240, 48);
-    for (int y = 0; y < 48; ++y) {
-        for (int x = 0; x < 240; ++x) stripes.Set(x, y, {x % 2 ? 1.0 : 0.0, 0.25, (x + y) % 2 ? 1.0 : 0.0, 1.0});
-    }
-    for (const RenderQuality quality : {RenderQuality::kMedium, RenderQuality::kHigh}) {
-        const DevicePicture source(GetDevice(), GetFormat(), stripes, 0);
-        const DevicePicture target(GetDevice(), GetFormat(), Picture(80, 16), 0);
-        EXPECT_EQ(Kiln::Scale(GetDevice(), source.GetData(), source.GetRowBytes(), 240, 48, target.GetData(),
-                              target.GetRowBytes(), 80, 16, GetFormat(), 1.0F / 3.0F, 1.0F / 3.0F, quality),
-                  Ostrand::kStatus_OK);
-        const Picture out = target.Download();
-        for (int y = 2; y < 14; ++y) {
-            for (int x = 2; x < 78; ++x) {
-                ASSERT_NEAR(out.At(x, y)[0], 0.5F, 0.06F) << x << ", " << y;
-                ASSERT_NEAR(out.At(x, y)[1], 0.25F, 1e-3F);
-                ASSERT_NEAR(out.At(x, y)[2], 0.5F, 0.06F);
-                ASSERT_EQ(out.At(x, y)[3], 1.0F);
-            }
-        }
-    }
-}
-
 TEST_P(FrameOperationsOnEachDevice, CopyFrameChangesFormatAndSize) {
     Random random;
     SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed());

@@ -181,25 +181,8 @@ TEST_P(FrameOnEachFramework, ReadsBackWithExactRounding) {
         const double clamped = values[i] > 0 ? std::min<double>(values[i], 1.0) : 0.0;
         ASSERT_EQ(RowOf(bytes, 0)[i], std::floor(clamped * 255.0 + 0.5)) << values[i];
     }
-}
-
-TEST_P(FrameOnEachFramework, ReadsBackLargeFramesAndRefusesOthers) {
-    const VideoFrameRef frame = MakeFrame(501, 701);
-    std::vector<float> values(501 * 701 * 4);
-    for (std::size_t i = 0; i < values.size(); ++i) values[i] = static_cast<float>(i % 256) / 255.0F;
-    WritePixels(frame, values.data());
-    const VideoFrameRef floats = MakeHostFrame(Vellum::kPixelFormat_BGRA_4444_32f, 501, 701);
-    const VideoFrameRef bytes = MakeHostFrame(Vellum::kPixelFormat_BGRA_4444_8u, 501, 701);
-    ASSERT_EQ(CopyFromDevice(floats, frame), 0);
-    ASSERT_EQ(CopyFromDevice(bytes, frame), 0);
-    for (std::size_t y = 0; y < 701; ++y) {
-        ASSERT_EQ(std::memcmp(RowOf(floats, static_cast<int>(y)), &values[y * 2004], 2004 * 4), 0) << y;
-        for (std::size_t x = 0; x < 2004; ++x) {
-            ASSERT_EQ(RowOf(bytes, static_cast<int>(y))[x], (y * 2004 + x) % 256) << x << ", " << y;
-        }
-    }
-    EXPECT_LT(CopyFromDevice(MakeHostFrame(Vellum::kPixelFormat_BGRA_4444_8u, 500, 701), frame), 0);
-    EXPECT_LT(CopyFromDevice(MakeHostFrame(Vellum::kPixelFormat_ARGB_4444_8u, 501, 701), frame), 0);
+    EXPECT_LT(CopyFromDevice(MakeHostFrame(Vellum::kPixelFormat_BGRA_4444_8u, width - 1, 1), frame), 0);
+    EXPECT_LT(CopyFromDevice(MakeHostFrame(Vellum::kPixelFormat_ARGB_4444_8u, width, 1), frame), 0);
     EXPECT_LT(CopyFromDevice(bytes, bytes), 0);
     EXPECT_LT(CopyFromDevice({}, frame), 0);
 }
@@ -218,33 +201,6 @@ TEST_P(FrameOnEachFramework, FillsOpaqueAndCopiesEqualFrames) {
     }
     EXPECT_LT(CopyEqualFrame(MakeFrame(4, 4), MakeFrame(4, 5)), 0);
     EXPECT_LT(CopyEqualFrame(MakeFrame(4, 4), MakeFrame(4, 4, kPixelFormat_GPU_BGRA_4444_16f)), 0);
-}
-
-TEST_P(FrameOnEachFramework, CopiesRowsBetweenUnequalLayouts) {
-    constexpr std::size_t kBytes = 40000;
-    const DeviceScratchBuffer source(mDevice, kBytes);
-    const DeviceScratchBuffer target(mDevice, kBytes);
-    const auto pixels = MakeBytes(kBytes, 5);
-    const ScopedDeviceAccess access(mDevice);
-    ASSERT_EQ(mDevice->GetCommands()->CopyHostToDevice(pixels.data(), source.GetHandle(), kBytes, nullptr), 0);
-    ASSERT_EQ(mDevice->GetBackend().Fill(target.GetHandle(), 0, 0, kBytes), 0);
-    ASSERT_EQ(mDevice->GetBackend().CopyRows(target.GetHandle(), {64, 700}, source.GetHandle(), {256, 512}, 100, 50),
-              0);
-    std::vector<std::uint8_t> expected(kBytes, 0);
-    for (std::size_t row = 0; row < 50; ++row) std::memcpy(&expected[64 + row * 700], &pixels[256 + row * 512], 100);
-    EXPECT_EQ(ReadBytes(target.GetHandle(), kBytes), expected);
-}
-
-TEST_P(FrameOnEachFramework, FramesGiveTheirMemoryBack) {
-    VideoFrameRef frame = MakeFrame(640, 360);
-    const std::uint64_t block = ViewDeviceFrame(frame).data;
-    const VideoFrameRef other = frame;
-    frame.Reset();
-    EXPECT_NE(mDevice->GetDeviceMemory()->GetFigures().bytesInUse, 0U);
-    const_cast<VideoFrameRef&>(other).Reset();
-    EXPECT_EQ(mDevice->GetDeviceMemory()->GetFigures().bytesInUse, 0U);
-    EXPECT_EQ(ViewDeviceFrame(MakeFrame(640, 360)).data, block);
-    mDevice->GetDeviceMemory()->ReleaseUnused(kAll);
 }
 
 }  // namespace

@@ -93,22 +93,6 @@ TEST(CopyToHostFrame, ARampKeepsItsPlace) {
     }
 }
 
-// Stripes of one pixel: an area-correct reduction sees their mean, a point sample one of them.
-TEST(CopyToHostFrame, ReductionCountsEveryPixelAtHighQuality) {
-    const VideoFrameRef source = MakeHostFrame(Vellum::kPixelFormat_BGRA_4444_32f, 96, 96);
-    ForEachValue<float>(
-        source, [](float& value, int x, int y, int c) { value = c == 3 ? 1.0F : static_cast<float>((x + y) % 2); });
-    const VideoFrameRef fine = MakeHostFrame(Vellum::kPixelFormat_BGRA_4444_32f, 24, 24);
-    ASSERT_EQ(CopyToHostFrame(fine, source, RenderQuality::kHigh), 0);
-    const VideoFrameRef coarse = MakeHostFrame(Vellum::kPixelFormat_BGRA_4444_32f, 24, 24);
-    ASSERT_EQ(CopyToHostFrame(coarse, source, RenderQuality::kLow), 0);
-    for (int x = 3; x < 21; ++x) {
-        EXPECT_NEAR(PixelAt<float>(fine, x, 12)[0], 0.5F, 0.01F);
-        const float sample = PixelAt<float>(coarse, x, 12)[0];
-        EXPECT_TRUE(sample == 0.0F || sample == 1.0F) << sample;
-    }
-}
-
 TEST(CopyToHostFrame, TransparentColourDoesNotBleed) {
     for (const auto format : {Vellum::kPixelFormat_BGRA_4444_8u, Vellum::kPixelFormat_ARGB_4444_8u}) {
         const int alpha = format == Vellum::kPixelFormat_ARGB_4444_8u ? 0 : 3;

@@ -78,26 +78,6 @@ TEST_P(ModuleOnEachFramework, QueuedWorkRunsInOrderAndBlocksPassOnInIt) {
     EXPECT_EQ(ReadFloats(kept.GetHandle(), kCount), std::vector<float>(kCount, 190.5F));
 }
 
-TEST_P(ModuleOnEachFramework, CommandsLaunchAKernelWhoseArgumentsAreSet) {
-    const ScopedDeviceAccess access(mDevice);
-    const DeviceScratchBuffer values(mDevice, 64);
-    ASSERT_EQ(mDevice->GetBackend().Fill(values.GetHandle(), 0, 0, 64), 0);
-    const std::uint64_t kernel = mDevice->FindKernel(kProbe, "StepKernel");
-    ASSERT_NE(kernel, 0U);
-    EXPECT_EQ(mDevice->FindKernel(kProbe, "StepKernel"), kernel);
-    KernelArguments arguments;
-    AddArgument(arguments, values.GetHandle());
-    AddArgument(arguments, std::int32_t{16});
-    AddArgument(arguments, 1.0F);
-    AddArgument(arguments, 4.0F);
-    EXPECT_EQ(arguments.GetByteCount(), 20U);
-    ASSERT_EQ(mDevice->GetBackend().SetArguments(kernel, arguments), 0);
-    EXPECT_EQ(mDevice->GetCommands()->Launch(kernel, 1, 1, 16, 16, 0), 0);
-    EXPECT_EQ(ReadFloats(values.GetHandle(), 16), std::vector<float>(16, 4.0F));
-    EXPECT_LT(mDevice->GetCommands()->Launch(0, 1, 1, 16, 16, 0), 0);
-    EXPECT_LT(mDevice->GetCommands()->Launch(kernel, 0, 1, 16, 16, 0), 0);
-}
-
 TEST_P(ModuleOnEachFramework, MissesAreTracedAndTold) {
     std::string traced;
     Halden::debug::SetTraceSink([&traced](const std::string& line) { traced += line + "\n"; });
