@@ -90,33 +90,6 @@ TEST_P(KernelTest, PointwiseKernelsMatchPlainLoopsAndLeaveTheRestAlone) {
     });
 }
 
-TEST_P(KernelTest, CopyingKeepsEveryHalfAndEveryFloat) {
-    DeviceFrame in(256, 64, 256, 0), out(256, 64, 256, 0);
-    std::vector<unsigned char> bytes(256 * 64 * 8);
-    for (std::size_t i = 0; i < bytes.size() / 2; ++i) {
-        // A signalling NaN comes out quiet, so its quiet form goes in.
-        auto half = static_cast<std::uint16_t>(i);
-        if ((half & 0x7C00U) == 0x7C00U && (half & 0x3FFU) != 0) half |= 0x200U;
-        std::memcpy(&bytes[2 * i], &half, 2);
-    }
-    in.WriteBytes(bytes);
-    const auto copy = [&](const DeviceFrame& target, const DeviceFrame& source) {
-        Run("CopyKernel", source.width, source.height,
-            Arguments(source.format, target.data, source.width, source.height, target.pitch, source.data,
-                      source.pitch));
-    };
-    copy(out, in);
-    EXPECT_EQ(out.ReadBytes(), bytes);
-
-    DeviceFrame floats(31, 3, 31, 1), copied(31, 3, 31, 1);
-    std::vector<Pixel> pixels = RandomPixels(93, mRandom, -1e30F, 1e30F);
-    pixels[5].value[0] = kInfinity;
-    pixels[40].value[3] = -kInfinity;
-    floats.Write(pixels);
-    copy(copied, floats);
-    EXPECT_EQ(copied.ReadBytes(), floats.ReadBytes());
-}
-
 TEST_P(KernelTest, GatherKernelsMatchPlainLoops) {
     ForShapes([&](int width, int height, int format, int pitch) {
         DeviceFrame in(width, height, pitch, format), out(width, height, pitch, format);
@@ -141,50 +114,6 @@ TEST_P(KernelTest, GatherKernelsMatchPlainLoops) {
                               }),
                    GetRelative(format), 1e-6, width);
     });
-}
-
-TEST_P(KernelTest, PassesDownTheColumnsMatchPlainLoops) {
-    constexpr int kColumns = 101, kRows = 40, kPitch = 104;
-    DeviceFrame in(kPitch / 4, kRows, kPitch / 4, 1), out(kPitch / 4, kRows, kPitch / 4, 1);
-    in.Write(RandomPixels(kPitch / 4 * kRows, mRandom));
-    CUfunction function = Find("ColumnKernel");
-    int pitch = kPitch, columns = kColumns, rows = kRows;
-    float factor = 0.75F;
-    CUdeviceptr source = in.data, target = out.data;
-    void* parameters[] = {&source, &target, &pitch, &columns, &rows, &factor};
-    CHECK_CUDA(cuLaunchKernel(function, 1, 1, 1, 128, 1, 1, 0, nullptr, parameters, nullptr));
-    const auto values = in.Read(), results = out.Read();
-    for (int x = 0; x < kPitch; ++x) {
-        double state = 0;
-        for (int y = 0; y < kRows; ++y) {
-            const auto i = static_cast<std::size_t>(y * kPitch + x);
-            state = state * 0.75 + values[i / 4].value[i % 4];
-            if (x < kColumns) {
-                EXPECT_NEAR(results[i / 4].value[i % 4], state, 1e-5) << x << ", " << y;
-            }
-        }
-    }
-}
-
-TEST_P(KernelTest, BytesGoThroughFramesUnchanged) {
-    constexpr int kWidth = 61, kHeight = 17;
-    std::vector<unsigned char> bytes(kWidth * kHeight * 4);
-    for (std::size_t i = 0; i < bytes.size(); ++i) bytes[i] = static_cast<unsigned char>(i * 7 + i / 256);
-    CUdeviceptr packed = 0;
-    CHECK_CUDA(cuMemAlloc_v2(&packed, bytes.size()));
-    for (int format = 0; format < 2; ++format) {
-        DeviceFrame frame(kWidth, kHeight, kWidth + 3, format);
-        CHECK_CUDA(cuMemcpyHtoD_v2(packed, bytes.data(), bytes.size()));
-        Run("UnpackKernel", kWidth, kHeight,
-            Arguments(packed, kWidth, frame.data, frame.pitch, format, kWidth, kHeight));
-        EXPECT_NEAR(frame.Read()[1].value[0], bytes[4] / 255.0, 1e-3);
-        CHECK_CUDA(cuMemsetD8_v2(packed, 0, bytes.size()));
-        Run("PackKernel", kWidth, kHeight, Arguments(frame.data, frame.pitch, format, packed, kWidth, kWidth, kHeight));
-        std::vector<unsigned char> back(bytes.size());
-        CHECK_CUDA(cuMemcpyDtoH_v2(back.data(), packed, back.size()));
-        EXPECT_EQ(back, bytes);
-    }
-    CHECK_CUDA(cuMemFree_v2(packed));
 }
 
 /// The functions of a device file at work, against the C library in double precision.

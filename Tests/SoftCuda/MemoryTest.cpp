@@ -138,18 +138,6 @@ TEST_F(MemoryTest, FillsWriteTheirPattern) {
     CHECK_CUDA(cuMemFree_v2(block));
 }
 
-TEST_F(MemoryTest, HostMemoryIsRegisteredOnce) {
-    std::array<char, 4096> memory{};
-    CHECK_CUDA(cuMemHostRegister_v2(memory.data(), memory.size(), 0));
-    EXPECT_EQ(Api().cuMemHostRegister_v2(memory.data() + 100, 50, 0), CUDA_ERROR_HOST_MEMORY_ALREADY_REGISTERED);
-    CHECK_CUDA(cuMemHostUnregister(memory.data()));
-    EXPECT_EQ(Api().cuMemHostUnregister(memory.data()), CUDA_ERROR_HOST_MEMORY_NOT_REGISTERED);
-    void* pinned = nullptr;
-    CHECK_CUDA(cuMemHostAlloc(&pinned, 8 << 20, CU_MEMHOSTALLOC_PORTABLE));
-    CHECK_CUDA(cuMemFreeHost(pinned));
-    EXPECT_EQ(Api().cuMemFreeHost(pinned), CUDA_ERROR_INVALID_VALUE);
-}
-
 TEST_F(MemoryTest, FramesOutsideLiveMemoryDontLaunch) {
     DeviceFrame frame(32, 32, 32, 1);
     const auto launch = [&](CUdeviceptr data, int pitch, int height) {

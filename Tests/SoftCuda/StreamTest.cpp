@@ -97,35 +97,4 @@ TEST_F(StreamTest, StreamsWaitForEachOthersEventsAndForTheDefaultStream) {
     CHECK_CUDA(cuStreamDestroy_v2(other));
 }
 
-TEST_F(StreamTest, ManyThreadsUseOneContextAtOnce) {
-    constexpr int kThreads = 8;
-    std::vector<std::thread> threads;
-    for (int t = 0; t < kThreads; ++t)
-        threads.emplace_back([this, t] {
-            CHECK_CUDA(cuCtxPushCurrent_v2(mContext));
-            CUstream stream = nullptr;
-            CHECK_CUDA(cuStreamCreate(&stream, CU_STREAM_NON_BLOCKING));
-            // Functions hold the arguments set last: each thread has its own by loading the module itself.
-            CUmodule module = nullptr;
-            CHECK_CUDA(cuModuleLoadData(&module, FindImage("TestKernels")));
-            CUfunction function = nullptr;
-            CHECK_CUDA(cuModuleGetFunction(&function, module, "GainKernel"));
-            for (int round = 0; round < 20; ++round) {
-                DeviceFrame frame(200 + t, 30, 200 + t, round % 2);
-                frame.Write(std::vector<Pixel>(static_cast<std::size_t>((200 + t) * 30), Pixel{{1, 1, 1, 1}}));
-                int pitch = frame.pitch, format = frame.format, width = frame.width, height = frame.height;
-                float gain = 2.0F, lift = 0.0F;
-                CUdeviceptr data = frame.data;
-                void* parameters[] = {&data, &pitch, &format, &width, &height, &gain, &lift};
-                for (int i = 0; i < 4; ++i)
-                    CHECK_CUDA(cuLaunchKernel(function, 16, 2, 1, 16, 16, 1, 0, stream, parameters, nullptr));
-                CHECK_CUDA(cuStreamSynchronize(stream));
-                const std::vector<Pixel> result = frame.Read();
-                for (const Pixel& pixel : {result.front(), result.back()}) ASSERT_EQ(pixel.value[1], 16.0F);
-            }
-            CHECK_CUDA(cuStreamDestroy_v2(stream));
-        });
-    for (std::thread& thread : threads) thread.join();
-}
-
 }  // namespace SoftCudaTest
