@@ -33,24 +33,6 @@ TEST(NodeHashes, DifferByContentOrderSplitAndLength) {
     EXPECT_TRUE(hashes.front().IsNil()) << "without items the state is still zero";
 }
 
-TEST(NodeHashes, FollowTheirDefinition) {
-    const Guid guid("00112233-4455-6677-8899-AABBCCDDEEFF");
-    std::uint8_t bytes[16];
-    Guid::GuidToBytes(guid, bytes);
-    HashValue value;
-    value.w3 += 14;
-    MixHash::MixInData(value, "SolidColorNode", 14);
-    value.w3 += 16;
-    MixHash::MixInData(value, bytes, 16);
-
-    const auto high = [](std::uint32_t word) { return static_cast<std::uint16_t>(word >> 16); };
-    const auto byte = [](std::uint32_t word, int shift) { return static_cast<std::uint8_t>(word >> shift); };
-    const Guid expected(value.w0, high(value.w1), static_cast<std::uint16_t>(value.w1),
-                        {byte(value.w2, 24), byte(value.w2, 16), byte(value.w2, 8), byte(value.w2, 0),
-                         byte(value.w3, 24), byte(value.w3, 16), byte(value.w3, 8), byte(value.w3, 0)});
-    EXPECT_EQ(NodeHasher().Text("SolidColorNode").Identifier(guid).Finish(), expected);
-}
-
 // Every bit of the state and of the data reaches every word: a hash that drops part of the state collides here.
 TEST(MixedData, DependsOnEveryBitOfStateAndData) {
     const HashValue start{1, 2, 3, 4};

@@ -129,14 +129,3 @@ TEST(HostConversions, KeepWhatIsKnownAndReplaceTheRest) {
     EXPECT_EQ(Brae::SDKToVellumPulldownCadence(11), 0U);
     EXPECT_EQ(Brae::SDKToVellumPulldownCadence(-1), 0U);
 }
-
-TEST(DebugEntries, FallBackToTheDefaultUntilSetAndAfterRemoval) {
-    auto& database = Halden::debug::DebugDatabase::Instance();
-    EXPECT_EQ(database.GetEntry(u"Test.Entry", u"default"), u"default");
-    database.SetEntry(u"Test.Entry", u"");
-    EXPECT_EQ(database.GetEntry(u"Test.Entry", u"default"), u"");
-    database.SetEntry(u"Test.Entry", u"second");
-    EXPECT_EQ(database.GetEntry(u"Test.Entry", u"default"), u"second");
-    database.RemoveEntry(u"Test.Entry");
-    EXPECT_EQ(database.GetEntry(u"Test.Entry", u"default"), u"default");
-}

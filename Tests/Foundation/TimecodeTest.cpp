@@ -46,14 +46,5 @@ TEST(Timecode, FramesAreNumberedAsEachDisplayDoes) {
     }
 }
 
-TEST(Timecode, EachDisplayCountsByItsRate) {
-    const FrameRate rate = FrameRate::FromFraction(48, 1);
-    EXPECT_EQ(GetFrameRateForTimeDisplay(kTimeDisplay_25, rate), FrameRate::FromFraction(25, 1));
-    EXPECT_EQ(GetFrameRateForTimeDisplay(kTimeDisplay_2997Drop, rate), FrameRate::FromFraction(30000, 1001));
-    EXPECT_EQ(GetFrameRateForTimeDisplay(kTimeDisplay_5994, rate), FrameRate::FromFraction(60000, 1001));
-    EXPECT_EQ(GetFrameRateForTimeDisplay(kTimeDisplay_Frames, rate), rate);
-    EXPECT_EQ(GetFrameRateForTimeDisplay(77, rate), rate);
-}
-
 }  // namespace
 }  // namespace Vellum

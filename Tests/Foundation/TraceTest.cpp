@@ -41,21 +41,6 @@ TEST(Tracing, IsGatedByCategoryAndLevel) {
     EXPECT_FALSE(debug::TraceEnabled("Test.Levels", 0, 1));
 }
 
-TEST(Tracing, CountsChangesOnly) {
-    const std::uint32_t start = debug::TraceChangeCount();
-    EXPECT_NE(start, 0U);
-    debug::SetTraceLevel("Test.Count", -1);
-    EXPECT_EQ(debug::TraceChangeCount(), start) << "the category was off already";
-    debug::SetTraceLevel("Test.Count", 5);
-    const std::uint32_t enabled = debug::TraceChangeCount();
-    EXPECT_NE(enabled, start);
-    debug::SetTraceLevel("Test.Count", 5);
-    EXPECT_EQ(debug::TraceChangeCount(), enabled);
-    debug::SetTraceLevel("Test.Count", 4);
-    EXPECT_NE(debug::TraceChangeCount(), enabled);
-    debug::SetTraceLevel("Test.Count", -1);
-}
-
 TEST(Tracing, GateFollowsItsCategory) {
     debug::TraceGate gate("Test.Gate", 10);
     EXPECT_FALSE(gate.IsOpen());
