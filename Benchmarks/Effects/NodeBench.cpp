@@ -49,6 +49,9 @@ const struct {
     {"directional blur, level", "TQ.XQVE Motion Blur", {{0, 90.0}, {1, 30.0}}},
     {"drop shadow, soft", "TQ.XQVE Drop Shadow", {{1, 128.0}, {3, 20.0}, {4, 30.0}}},
     {"drop shadow, hard", "TQ.XQVE Drop Shadow", {{1, 128.0}, {3, 20.0}}},
+    {"ultra key", "TQ.XQVE Ultra Key", {}},
+    {"ultra key, choked and softened", "TQ.XQVE Ultra Key", {{11, 30.0}, {12, 30.0}}},
+    {"ultra key, choked and softened fully", "TQ.XQVE Ultra Key", {{11, 100.0}, {12, 100.0}}},
 };
 
 void Check(bool good) {

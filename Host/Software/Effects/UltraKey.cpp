@@ -56,10 +56,6 @@ Light CorrectColor(Light c, const UltraKey& controls) {
     return c;
 }
 
-double NearPart(double along, double across, double narrowness) {
-    return std::max(std::min(along, 1.5 * (along - narrowness / std::sqrt(3.0) * across)), 0.0);
-}
-
 /// 1 at a half, 0 at 1, without end at 0.
 double Ramp(double fraction) {
     if (fraction == 0.0) return std::numeric_limits<float>::max();
@@ -68,6 +64,15 @@ double Ramp(double fraction) {
 
 double OverRamp(double share, double fraction) { return std::min(share / std::max(Ramp(fraction), 1e-6), 1.0); }
 
+/// The cotangents of the angles from a hue to where others begin, on the side of rising hue and on the other.
+std::array<double, 2> LeanOf(double u, double v) {
+    constexpr double kThird = 2.0943951023931953, kMost = kThird / 8.0;
+    const double hue = std::atan2(v, u);  // of blue 0, of green and red a third to either side
+    const double off = hue - std::round(hue / kThird) * kThird;
+    const double turn = std::copysign(std::min({std::abs(off), kMost, kThird / 2.0 - std::abs(off)}), off);
+    return {1.0 / std::tan(kThird / 2.0 - turn), 1.0 / std::tan(kThird / 2.0 + turn)};
+}
+
 class Keyer {
 public:
     explicit Keyer(const UltraKey& controls)
@@ -75,25 +80,25 @@ public:
         if (mLength > mKey.luma * 1e-3) {
             mU = mKey.u / mLength;
             mV = mKey.v / mLength;
+            mPerChroma = mKey.luma / mLength;
+            mLean = LeanOf(mU, mV);
         }
         const bool isColorView = controls.output == kUltraKeyOutput_Color;
         mTransparency = isColorView ? 0.0 : controls.transparency;
+        mNarrowness = std::max(1.0 - controls.tolerance, 0.0) / std::max(controls.tolerance, 1e-6);
     }
 
     [[nodiscard]] Pixel Apply(const Pixel& p) const {
         const Chroma c = Analyse(p);
-        const double along = c.u * mU + c.v * mV, across = std::abs(c.v * mU - c.u * mV);
-        const double expected = Expected(c.luma);
-        const double perChroma = mU == 0.0 && mV == 0.0 ? 0.0 : mKey.luma / mLength;
-        const double tolerance = mControls.tolerance;
-        const double narrowness = std::max(1.0 - tolerance, 0.0) / std::max(tolerance, 1e-6);
-        const double screen = std::min(NearPart(along, across, narrowness) * perChroma / expected, 1.0);
+        const double share = NearPart(c, mNarrowness) * mPerChroma / mKey.luma;
+        const double expected = Expected(share, (c.luma / mKey.luma - share) * mPerChroma);
+        const double screen = Limit(share / expected, 0.0, 1.0);
 
-        const double spilt = NearPart(along, across, std::max(Ramp(mControls.range), 0.0));
+        const double spilt = NearPart(c, std::max(Ramp(mControls.range), 0.0));
         const double amount = std::max(2.0 * mControls.spill, 0.0);
-        const double light = std::min(amount, 1.0) * spilt * perChroma;
-        const double share = std::min(light / expected, 1.0);
-        const double gain = 1.0 + 2.0 * mControls.luma * share / std::max(1.0 - share, 0.125);
+        const double light = std::min(amount, 1.0) * spilt * mPerChroma;
+        const double lit = Limit(light / mKey.luma / expected, 0.0, 1.0);
+        const double gain = 1.0 + 2.0 * mControls.luma * lit / std::max(1.0 - lit, 0.125);
         const double colorGain = gain * (1.0 - OverRamp(screen, mControls.desaturate));
         const double luma = c.luma > 0.0 ? std::max(c.luma - light, 0.0) : c.luma;
         const Light result = CorrectColor(
@@ -103,21 +108,31 @@ public:
     }
 
 private:
-    [[nodiscard]] double Expected(double luma) const {
-        const double below = luma + 2.0 * mControls.shadow * (mKey.luma - luma);
-        const double above = mKey.luma * (1.0 + 2.0 * mControls.highlight * (1.0 - mKey.luma / luma));
-        return std::max({luma < mKey.luma ? below : above, mKey.luma / 16.0, 1e-30});
+    [[nodiscard]] double NearPart(const Chroma& c, double narrowness) const {
+        const double along = c.u * mU + c.v * mV, turned = c.v * mU - c.u * mV;
+        const double across = std::abs(turned) * mLean[turned > 0.0 ? 0 : 1];
+        return std::max(std::min(along, 2.0 * (along - narrowness * across)), 0.0);
+    }
+    /// How bright the screen is here, by that share of the key's light and the rest beside it.
+    [[nodiscard]] double Expected(double share, double rest) const {
+        const double bright = share + 0.5 * rest, darkest = 2.0 * mControls.shadow;
+        const double pure = Limit(1.2 - 20.0 * darkest * rest / std::max(1.25 - share, 0.25), 0.0, 1.0);
+        const double below = 1.0 + pure * (std::max(bright, std::min(darkest, 1.0)) - 1.0) +
+                             std::max(darkest - 1.0, 0.0) * (1.0 - bright);
+        const double above = 1.0 + 2.0 * mControls.highlight * (share - share / bright);
+        return Limit(bright < 1.0 ? below : above, 1.0 / 16.0, 1e30);
     }
     [[nodiscard]] double Matte(double screen) const {
-        const double raw = 1.0 - OverRamp(screen, mTransparency);
-        return Limit(raw - mControls.pedestal * (1.0 - raw), 0.0, 1.0);
+        const double clear = OverRamp(screen, mTransparency);
+        return Limit(1.0 - clear - mControls.pedestal * clear * clear, 0.0, 1.0);
     }
 
     const UltraKey& mControls;
     Chroma mKey;
     double mLength;
-    double mU = 0.0, mV = 0.0;  ///< the key's direction; none without a hue
-    double mTransparency = 0.0;
+    double mU = 0.0, mV = 0.0, mPerChroma = 0.0;  ///< the key's direction and luma for its chroma; none without a hue
+    std::array<double, 2> mLean{};
+    double mTransparency = 0.0, mNarrowness = 0.0;
 };
 
 using Filter = double (*)(const std::vector<double>& values);

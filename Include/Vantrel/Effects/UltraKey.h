@@ -32,21 +32,30 @@ enum UltraKeyOutput : std::int32_t {
 ///     ramp(p) = 2 (1 - p) from 0.5 up, else 1 / (2 p): infinity at 0, 1 at 0.5, 0 at 1
 ///     y = BT.709 luma,  u = (2 B - R - G) / sqrt(18),  v = (G - R) / sqrt(6);  K: the same of the key colour
 ///
-/// The chroma of a pixel has a part `along` the key's chroma and a part `across` it. Colours near the key's hue count
-/// whole and those far from it not at all; the tolerance says what is near, at 0.5 30 and 60 degrees:
+/// The keyer is a colour difference keyer: a pixel has of the screen what its chroma has of the key's, as far as that
+/// hue can't be its own (P. Vlahos, US patent 3158477; A. R. Smith and J. F. Blinn, "Blue Screen Matting", SIGGRAPH
+/// 1996). A pixel's chroma has a part `along` the key's and a part `across` it. The two secondary colours beside the
+/// key's strongest channel, for green yellow and cyan, bound what may be screen. They lie 60 - d and 60 + d degrees
+/// from a key whose hue is d from that channel's; d counts up to 15 and no more than 60 - d. lean is the cotangent of
+/// the angle on the pixel's side. A tolerance of 0.5 ends at these bounds, a greater one goes beyond them:
 ///
-///     part(g) = max(0, min(along, 1.5 (along - g across / sqrt(3)))),  near = part((1 - tolerance) / tolerance)
+///     part(g) = max(0, min(along, 2 (along - g lean across))),  share = part((1 - tolerance) / tolerance) / |K chroma|
 ///
-/// How much of the pixel is screen is told by comparing with the key, as bright as it is expected there:
+/// That is the share of the screen if it is as bright as the key. How bright it is here is judged by the light beside
+/// it:
 ///
-///     below K.y   expected = y + 2 shadow (K.y - y)                  above    expected = K.y (1 + 2 highlight (1 - K.y
-///     / y)) screen = near / |K chroma| * K.y / expected, limited to 0..1;  expected is at least K.y / 16
+///     rest = (y / K.y - share) K.y / |K chroma|,  bright = share + rest / 2
+///     bright below 1    expected = 1 + pure (max(bright, min(d, 1)) - 1) + max(d - 1, 0) (1 - bright),  d = 2 shadow,
+///                       pure = 1.2 - 20 d rest / max(1.25 - share, 0.25), limited to 0..1
+///     else              expected = 1 + 2 highlight (share - share / bright)
+///     screen = share / expected, limited to 0..1;  expected is at least 1/16
 ///
-/// What is neutral in front of the screen then gets the exact share at a highlight of 0 and a shadow of 0.5. Less
-/// shadow takes darker parts for unevenly lit screen, more takes them for opaque; highlight does so with brighter
-/// parts.
+/// So a darker part with the key's pure colour is a less lit screen, down to d of the key's light, and below that
+/// something dark before it; one with other light in it, more than would be black, is something in front. No pixel by
+/// itself can tell a shadow from black. A brighter part is taken for a brighter screen by its purity. What is neutral
+/// in front of an even screen gets the exact share at a highlight of 0 and a shadow of 0.5.
 ///
-///     a = 1 - min(1, screen / ramp(transparency)),  matte = a - pedestal (1 - a), limited to 0..1
+///     a = min(1, screen / ramp(transparency)),  matte = 1 - a - pedestal a^2, limited to 0..1
 ///
 /// On the matte work two filters over (2 r + 1)^2 pixels, r = 4 radius, where part of a pixel is had by going that far
 /// from one whole reach to the next: choke takes the least (radius (choke + soften) / scale), soften then the mean
@@ -59,7 +68,7 @@ enum UltraKeyOutput : std::int32_t {
 ///
 ///     spilt = part(ramp(range)),  taken = 2 spill spilt,  light = min(1, 2 spill) spilt / |K chroma| * K.y
 ///     along' = along - taken,  y' = y - light (not below 0)
-///     share = light / expected, limited to 0..1,  all three times 1 + 2 luma share / max(1 - share, 1/8)
+///     lit = light / K.y / expected, limited to 0..1,  all three times 1 + 2 luma lit / max(1 - lit, 1/8)
 ///     chroma loses min(1, screen / ramp(desaturate)) of itself
 ///
 /// and at last go through a matrix: saturation, a turn of hue that keeps luma, and a gain luminance^2.2. A colour that
@@ -75,16 +84,18 @@ inline constexpr ParameterRow kUltraKeyParameters[] = {
      &GetUltraKeyOutputName},
     {2, "key_color", ParameterType::kColor, "", 0, 1, {0, 0.7, 0.25, 1}},
     UltraKeyParameter(4, "transparency", 50, "of the screen; 50 as it was mixed"),
-    UltraKeyParameter(5, "highlight", 10, "makes what is brighter than the key opaque"),
-    UltraKeyParameter(6, "shadow", 25, "makes what is darker than the key opaque; low for an uneven screen"),
-    UltraKeyParameter(7, "tolerance", 60, "how far from the key's hue is screen"),
+    UltraKeyParameter(5, "highlight", 50,
+                      "makes what is brighter than the key opaque: 50 all but a brighter screen, 100 that too"),
+    UltraKeyParameter(6, "shadow", 25,
+                      "makes what is darker than the key opaque: 25 what has less than half its light, 50 all"),
+    UltraKeyParameter(7, "tolerance", 50, "how far from the key's hue is screen: 50 to where another colour begins"),
     UltraKeyParameter(8, "pedestal", 10, "clears noise where the matte is low"),
     UltraKeyParameter(11, "choke", 0, "shrinks the matte, 4 pixels at 100"),
     UltraKeyParameter(12, "soften", 0, "blurs the matte's edge inward, 4 pixels at 100"),
     UltraKeyParameter(13, "contrast", 0, "of the matte, about the mid point"),
     UltraKeyParameter(14, "mid_point", 50, "stays under contrast"),
     UltraKeyParameter(17, "desaturate", 25, "of what is nearly transparent"),
-    UltraKeyParameter(18, "range", 75, "how far from the key's hue is spill"),
+    UltraKeyParameter(18, "range", 65, "how far from the key's hue is spill"),
     UltraKeyParameter(19, "spill", 50, "how much spill is taken; 50 all of it, above that the opposite shows"),
     UltraKeyParameter(20, "luma", 50, "how much brightness is given back for spill; 50 as it was mixed"),
     UltraKeyParameter(23, "saturation", 100, "of the colours", 200),
