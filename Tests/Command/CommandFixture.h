@@ -22,6 +22,17 @@ struct Outcome {
     std::string err;
 };
 
+/// What a shell's command writes, and its status.
+inline std::string OutputOf(const std::string& line, int* status = nullptr) {
+    FILE* pipe = popen(line.c_str(), "r");
+    std::string text;
+    std::array<char, 4096> buffer{};
+    for (std::size_t n = 0; (n = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0;) text.append(buffer.data(), n);
+    const int ended = pclose(pipe);
+    if (status) *status = WIFEXITED(ended) ? WEXITSTATUS(ended) : -1;
+    return text;
+}
+
 class Command : public testing::Test {
 protected:
     /// Runs the command through the shell, so that arguments and settings are written as a person writes them.
@@ -29,12 +40,7 @@ protected:
         const std::string errors = mFolder.Path("errors.txt");
         const std::string line = settings + " " VANTREL_COMMAND " " + arguments + " 2>" + errors;
         Outcome outcome;
-        FILE* pipe = popen(line.c_str(), "r");
-        std::array<char, 4096> buffer{};
-        for (std::size_t n = 0; (n = std::fread(buffer.data(), 1, buffer.size(), pipe)) > 0;)
-            outcome.out.append(buffer.data(), n);
-        const int status = pclose(pipe);
-        outcome.status = WIFEXITED(status) ? WEXITSTATUS(status) : -1;
+        outcome.out = OutputOf(line, &outcome.status);
         std::stringstream text;
         text << std::ifstream(errors).rdbuf();
         outcome.err = text.str();

@@ -6,7 +6,6 @@
 
 #include <tuple>
 
-#include "Tests/Command/Browser.h"
 #include "Tests/Command/CommandFixture.h"
 
 namespace Vantrel::Host::Test {
@@ -111,12 +110,8 @@ TEST_F(Inspect, TextShowsABarAndColoursOnlyATerminal) {
                                  HasSubstr("  1     24      24  00:00:01:00  00:00:02:00  partly host  no"),
                                  HasSubstr("media offline: holiday"), Not(HasSubstr("\033["))));
     const auto onTerminal = [&](const std::string& settings) {
-        const std::string output = Path("terminal.txt");
-        const std::string inner = settings + " " VANTREL_COMMAND " " + line + " 2>/dev/null";
-        std::ignore = std::system(("script -qec \"" + inner + "\" /dev/null >" + output + " </dev/null").c_str());
-        std::stringstream text;
-        text << std::ifstream(output).rdbuf();
-        return text.str();
+        return OutputOf("script -qec \"" + settings + " " VANTREL_COMMAND " " + line +
+                        " 2>/dev/null\" /dev/null </dev/null");
     };
     EXPECT_THAT(onTerminal(""), HasSubstr("\033["));
     EXPECT_THAT(onTerminal("NO_COLOR=1"), AllOf(HasSubstr("DDDD"), Not(HasSubstr("\033["))));
@@ -138,28 +133,44 @@ TEST_F(Inspect, SaysWhatIsWrong) {
     EXPECT_FALSE(std::filesystem::exists(Path("page.html")));
 }
 
+/// Clicks and presses in the page, and leaves of it what it showed each time.
+constexpr const char* kVisit = R"(<script>addEventListener('load', async () => {
+    const detail = () => document.getElementById('detail').textContent;
+    const told = [detail()];
+    const box = document.getElementById('stretch-1').getBoundingClientRect();
+    document.elementFromPoint(box.x + box.width / 2, box.y + box.height / 2)
+        .dispatchEvent(new MouseEvent('click', {bubbles: true}));
+    const image = document.querySelector('#detail img');
+    await image.decode();
+    told.push(detail(), [...document.querySelectorAll('.tree g')].map((g) => [g.dataset.name, g.classList[0]]),
+              document.querySelector('.tree g').getBoundingClientRect().width, image.naturalWidth);
+    document.getElementById('stretch-1').focus();
+    document.activeElement.dispatchEvent(new KeyboardEvent('keydown', {key: 'ArrowRight', bubbles: true}));
+    told.push(detail(), document.activeElement.id,
+              performance.getEntriesByType('resource').filter((e) => !e.name.startsWith('data:')));
+    document.body.textContent = '@@' + JSON.stringify(told).replace(/[<>&]/g, ' ') + '@@';
+})</script>)";
+
 TEST_F(Inspect, PageShowsTheTreeAndReasonOfTheStretchThatIsClicked) {
     const std::string page = Path("page.html");
     ASSERT_EQ(Run("inspect " + WriteMixed() + " --html " + page).status, 2);
-    Browser browser(Path("profile"));
-    browser.Open("file://" + page + "#0");
-    const std::string texts = "document.getElementById('detail').textContent";
-    const std::string nodes = "[...document.querySelectorAll('.tree g')].map((g) => [g.dataset.name, g.classList[0]])";
-    EXPECT_THAT(browser.Evaluate(texts).get<std::string>(), AllOf(HasSubstr("Whole frame"), Not(HasSubstr("Sparkle"))));
-
-    browser.Click("#stretch-1");
-    EXPECT_THAT(browser.Evaluate(texts).get<std::string>(), HasSubstr("no device version of the effect 'Sparkle'"));
-    EXPECT_EQ(browser.Evaluate(nodes), Json::parse(R"([["magic", "host"], ["Sparkle", "host"], ["Invert", "device"],
-                                                       ["Layers", "device"]])"));
-    EXPECT_GT(browser.Evaluate("document.querySelector('.tree g').getBoundingClientRect().width"), 50);
-    EXPECT_EQ(browser.Evaluate("document.querySelector('#detail img').naturalWidth"), 288);
-
-    browser.Evaluate("document.getElementById('stretch-1').focus()");
-    browser.Press("ArrowRight");
-    EXPECT_THAT(browser.Evaluate(texts).get<std::string>(), HasSubstr("media offline: holiday"));
-    EXPECT_EQ(browser.Evaluate("document.activeElement.id"), "stretch-2");
-    EXPECT_EQ(browser.Evaluate("performance.getEntriesByType('resource').filter((e) => !e.name.startsWith('data:'))"),
-              Json::array());
+    std::ofstream(page, std::ios::app) << kVisit;
+    const std::string dom = OutputOf(VANTREL_BROWSER
+                                     " --headless --no-sandbox --disable-gpu --virtual-time-budget=10000 --dump-dom"
+                                     " --window-size=1440,1000 --user-data-dir=" +
+                                     Path("profile") + " 'file://" + page + "#0' 2>/dev/null");
+    const std::size_t from = dom.find("@@"), to = dom.rfind("@@");
+    ASSERT_LT(from, to) << dom;
+    const Json told = Json::parse(dom.substr(from + 2, to - from - 2));
+    EXPECT_THAT(told[0].get<std::string>(), AllOf(HasSubstr("Whole frame"), Not(HasSubstr("Sparkle"))));
+    EXPECT_THAT(told[1].get<std::string>(), HasSubstr("no device version of the effect 'Sparkle'"));
+    EXPECT_EQ(told[2], Json::parse(R"([["magic", "host"], ["Sparkle", "host"], ["Invert", "device"],
+                                       ["Layers", "device"]])"));
+    EXPECT_GT(told[3], 50);
+    EXPECT_EQ(told[4], 288);
+    EXPECT_THAT(told[5].get<std::string>(), HasSubstr("media offline: holiday"));
+    EXPECT_EQ(told[6], "stretch-2");
+    EXPECT_EQ(told[7], Json::array()) << "it loads nothing from elsewhere";
 }
 
 }  // namespace
