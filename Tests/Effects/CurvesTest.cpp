@@ -39,36 +39,6 @@ protected:
     }
 };
 
-TEST_P(CurvesOnEachDevice, EachCurveOfThePointsActsOnItsChannel) {
-    Random random;
-    SCOPED_TRACE(random.GetSeed());
-    for (std::int32_t curve = 0; curve < 5; ++curve) {
-        Points points, scaled;
-        for (double x = random.Int(0, 40); x < 256.0 && points.size() < 16; x += random.Int(12, 60)) {
-            const double y = std::min(std::max(x + random.Int(-30, 30), 0.0), 255.0);
-            points.push_back({x + 0.9, y});  // a level's fraction doesn't count
-            scaled.push_back({static_cast<float>(x) / 255.0F, static_cast<float>(y) / 255.0F});
-        }
-        const Curve expectedCurve(scaled);
-        const bool isLuma = curve == 4;
-        const Picture in = RoundTo(RandomPicture(random, random.Int(1, 200), 3), GetFormat());
-        const Picture out = isLuma ? Apply(kLumaCurve, WithCurve(5, points, kLumaCurveEffect), in)
-                                   : Apply(kRgbCurves, WithCurve(5 + 32 * curve, points, kRGBCurvesEffect), in);
-        Picture expected = in;
-        for (int i = 0; i < in.width * in.height; ++i) {
-            auto p = in.Get(i % in.width, i / in.width);
-            const double luma = 0.2126 * p[2] + 0.7152 * p[1] + 0.0722 * p[0];
-            for (int c = 0; c < 3; ++c) {
-                double& value = p[static_cast<std::size_t>(c)];
-                if (isLuma) value += expectedCurve.At(luma) - luma;
-                if (curve == 0 || curve == 3 - c) value = expectedCurve.At(value);
-            }
-            expected.Set(i % in.width, i / in.width, p);
-        }
-        EXPECT_TRUE(PicturesAgree(out, RoundTo(expected, GetFormat()), GetTolerance())) << "curve " << curve;
-    }
-}
-
 TEST_P(CurvesOnEachDevice, PointsInAnyDisorderGiveNumbers) {
     const float huge = IsHalf() ? 60000.0F : 1e30F;
     const Picture in = Levels({-huge, -INFINITY, -0.5F, 0.0F, 0.25F, 0.5F, 1.0F, 2.0F, INFINITY, huge});

@@ -11,16 +11,19 @@
 #include "Ostrand/QueryTable.h"
 #include "Src/Nodes/NodeRegistry.h"
 #include "Src/VideoNodes/VideoNodeFactory.h"
+#include "Tests/Support/FakeFrame.h"
 #include "Vantrel/RenderSystem.h"
 
 namespace Vantrel::Testing {
 namespace {
 
-class PaddedFrame final : public Ostrand::Counted<PaddedFrame, Marl::IVideoFrame, Marl::IFrameIdentity,
-                                                  Marl::IFrameData, Marl::IFrameRows, Kiln::IDeviceFrame> {
+class PaddedFrame final
+    : public Ostrand::Counted<PaddedFrame, FrameAttributes, Marl::IFrameData, Marl::IFrameRows, Kiln::IDeviceFrame> {
 public:
     PaddedFrame(const Kiln::DeviceRef& device, std::unique_ptr<DevicePicture> picture, Vellum::PixelFormat format)
-        : mDevice(device), mPicture(std::move(picture)), mFormat(format) {}
+        : Counted(Vellum::Rect{0, 0, picture->GetWidth(), picture->GetHeight()}, format),
+          mDevice(device),
+          mPicture(std::move(picture)) {}
 
     Status QueryInterface(const Guid& iid, void** out) override {
         return Ostrand::QueryTable(this, iid, out)
@@ -31,30 +34,13 @@ public:
             .Answer<Kiln::IDeviceFrame>()
             .Result();
     }
-    Guid GetHash() const override { return mHash; }
-    void SetHash(const Guid& hash) override { mHash = hash; }
-    Vellum::Rect GetBounds() const override { return {0, 0, mPicture->GetWidth(), mPicture->GetHeight()}; }
-    Vellum::Point GetOrigin() const override { return mOrigin; }
-    void SetOrigin(Vellum::Point origin) override { mOrigin = origin; }
-    Vellum::PixelFormat GetPixelFormat() const override { return mFormat; }
-    Vellum::PixelAspectRatio GetPixelAspectRatio() const override { return mAspect; }
-    void SetPixelAspectRatio(Vellum::PixelAspectRatio aspect) override { mAspect = aspect; }
-    std::uint32_t GetFieldType() const override { return Vellum::kFieldType_Progressive; }
-    void SetFieldType(std::uint32_t) override {}
-    std::uint32_t GetAlphaType() const override { return Vellum::kAlphaType_Straight; }
-    void SetAlphaType(std::uint32_t) override {}
     std::uint64_t GetData() const override { return mPicture->GetData(); }
     std::int32_t GetRowBytes() const override { return mPicture->GetRowBytes(); }
-
     const Kiln::DeviceRef& GetDevice() const override { return mDevice; }
 
 private:
     Kiln::DeviceRef mDevice;
     std::unique_ptr<DevicePicture> mPicture;
-    Vellum::PixelFormat mFormat;
-    Guid mHash;
-    Vellum::Point mOrigin;
-    Vellum::PixelAspectRatio mAspect;
 };
 
 std::array<double, 4> RandomValue(Random& random, const ParameterRow& row) {
@@ -143,7 +129,9 @@ std::string Describe(const EffectRow& effect, const ParameterValues& values) {
     std::ostringstream text;
     text << effect.matchName;
     for (std::size_t i = 0; i < effect.parameterCount; ++i) {
-        const auto& value = values.at(effect.parameters[i].index);
+        const auto found = values.find(effect.parameters[i].index);
+        if (found == values.end()) continue;
+        const auto& value = found->second;
         if (value != effect.parameters[i].value) text << ", " << effect.parameters[i].name << " " << value[0];
     }
     return text.str();
@@ -229,6 +217,41 @@ EffectTest::Recorded EffectTest::Record(const std::string& matchName, const Para
     VideoFrameRef output;
     const Status status = TryRenderOver(node, input, output);
     return {status, input, DownloadFrame(GetDevice(), output ? output : input), recorder.kernels};
+}
+
+Host::Software::LayerPicture EffectTest::OnHost(const EffectRow& effect, const ParameterValues& values,
+                                                Host::Software::LayerPicture layer,
+                                                Host::Software::EffectContext context) {
+    const Host::Software::EffectFunction function = Host::Software::FindEffectFunction(effect.matchName);
+    EXPECT_NE(function, nullptr) << effect.matchName << " has no scalar version";
+    context.matchName = effect.matchName;
+    context.value = [&values](std::int32_t index) {
+        const auto found = values.find(index);
+        return found == values.end() ? std::array<double, 4>{} : found->second;
+    };
+    if (context.view.width == 0) {
+        context.view.width = context.view.sequenceWidth = layer.picture.width;
+        context.view.height = context.view.sequenceHeight = layer.picture.height;
+    }
+    if (function) function(context, layer);
+    return layer;
+}
+
+void EffectTest::ExpectAgreement(const RenderNodeRef& node, const EffectRow& effect, const ParameterValues& values,
+                                 const Picture& picture, const Tolerance& tolerance, Vellum::PixelAspectRatio aspect) {
+    Host::Software::LayerPicture layer;
+    layer.picture = picture;
+    layer.aspect = aspect;
+    layer = OnHost(effect, values, layer);
+    const VideoFrameRef input = MakePaddedFrame(GetDevice(), GetFormat(), picture, 3);
+    input->SetPixelAspectRatio(aspect);
+    const VideoFrameRef output = RenderOver(node, input);
+    EXPECT_EQ(output->GetOrigin(), layer.origin);
+    EXPECT_EQ(output->GetPixelAspectRatio(), aspect);
+    EXPECT_EQ(output->GetPixelFormat(), GetFormat());
+    EXPECT_TRUE(
+        PicturesAgree(DownloadFrame(GetDevice(), output), RoundTo(std::move(layer.picture), GetFormat()), tolerance))
+        << Describe(effect, values) << "; " << picture.width << " by " << picture.height;
 }
 
 }  // namespace Vantrel::Testing

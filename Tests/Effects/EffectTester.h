@@ -8,6 +8,7 @@
 #include <string>
 #include <vector>
 
+#include "Host/Software/EffectContext.h"
 #include "Src/Nodes/RenderNodeBase.h"
 #include "Tests/Effects/KernelArguments.h"
 #include "Tests/Support/DevicePictures.h"
@@ -85,6 +86,15 @@ protected:
         std::vector<KernelArguments::List> kernels;
     };
     [[nodiscard]] Recorded Record(const std::string& matchName, const Params& params, const Picture& picture);
+
+    /// The effect's scalar version on a layer, for a sequence of the picture's size unless the context has a view.
+    [[nodiscard]] static Host::Software::LayerPicture OnHost(const EffectRow& effect, const ParameterValues& values,
+                                                             Host::Software::LayerPicture layer,
+                                                             Host::Software::EffectContext context = {});
+
+    /// Renders an effect's node over a picture and expects the place and the pixels of its scalar version.
+    void ExpectAgreement(const RenderNodeRef& node, const EffectRow& effect, const ParameterValues& values,
+                         const Picture& picture, const Tolerance& tolerance, Vellum::PixelAspectRatio aspect = {1, 1});
 
     /// What the plain solution reaches on every device, for values of about 1.
     [[nodiscard]] Tolerance GetTolerance() const {

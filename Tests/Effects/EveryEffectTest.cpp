@@ -1,16 +1,16 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
 // What holds of every effect: its kernel agrees with the scalar version, and its defaults leave the picture alone.
-#include "Host/Software/EffectContext.h"
+#include <algorithm>
+#include <cmath>
+#include <set>
+
+#include "Src/Nodes/NodeRegistry.h"
 #include "Tests/Effects/EffectTester.h"
 #include "Vantrel/EffectTable.h"
 
 namespace Vantrel::Testing {
 namespace {
-
-using Host::Software::EffectContext;
-using Host::Software::EffectFunction;
-using Host::Software::LayerPicture;
 
 /// What makes an effect's comparison its own.
 struct EffectCase {
@@ -32,30 +32,7 @@ bool Softens(const EffectRow& effect, const ParameterValues& values) {
     return false;
 }
 
-class EveryEffect : public EffectTest {
-protected:
-    Picture OnDevice(const EffectRow& effect, const ParameterValues& values, const Picture& picture) {
-        return Apply(effect.matchName, ToParams(effect, values), picture);
-    }
-
-    static Picture OnHost(const EffectRow& effect, const ParameterValues& values, const Picture& picture) {
-        const EffectFunction function = Host::Software::FindEffectFunction(effect.matchName);
-        EXPECT_NE(function, nullptr) << effect.matchName << " has no scalar version";
-        LayerPicture layer;
-        layer.picture = picture;
-        layer.aspect = {1, 1};
-        EffectContext context;
-        context.matchName = effect.matchName;
-        context.value = [&values](std::int32_t index) {
-            const auto found = values.find(index);
-            return found == values.end() ? std::array<double, 4>{} : found->second;
-        };
-        context.view.width = context.view.sequenceWidth = picture.width;
-        context.view.height = context.view.sequenceHeight = picture.height;
-        if (function) function(context, layer);
-        return layer.picture;
-    }
-};
+using EveryEffect = EffectTest;
 
 constexpr EffectCase kCases[] = {
     {"TQ.XQVE Luma Corrector", 0.02, true, 30.0},
@@ -75,6 +52,8 @@ constexpr EffectCase kCases[] = {
     {"TQ.XQVE Fast Color Corrector", 0.01, true, 100.0},
     {"KL.XQVE Gamma Correction"},
     {"KL.XQVE Horizontal Flip", 0.0, false},
+    // The saturation of a colour that is grey but for a last place has no more digits than that place.
+    {"TQ.XQVE Invert", 0.002, false},
     {"TQ.XQVE Noise"},
     {"TQ.XQVE ProcAmp"},
     {"TQ.XQVE Tint"},
@@ -110,26 +89,96 @@ TEST_P(EveryEffect, AgreesWithItsScalarVersion) {
             tolerance.relative *= effectCase.slack;
             // The weights of a wide recursion nearly cancel: their rounding shows as gain.
             if (Softens(*effect, values)) tolerance = {5e-3, 5e-3, false, effectCase.exceptionShare};
-            EXPECT_TRUE(PicturesAgree(OnDevice(*effect, values, picture),
-                                      RoundTo(OnHost(*effect, values, picture), GetFormat()), tolerance))
-                << Describe(*effect, values) << "; " << picture.width << " by " << picture.height << ", seed "
-                << random.GetSeed();
+            ExpectAgreement(MakeEffect(effect->matchName, ToParams(*effect, values)), *effect, values, picture,
+                            tolerance);
         }
     }
 }
 
 TEST_P(EveryEffect, ItsDefaultsKeepEveryBit) {
     Random random;
-    SCOPED_TRACE(random.GetSeed());
     for (const EffectCase& effectCase : kCases) {
         if (!effectCase.neutralByDefault) continue;
         const EffectRow& effect = *FindEffect(effectCase.matchName);
-        ParameterValues values;
-        for (std::size_t i = 0; i < effect.parameterCount; ++i) {
-            values[effect.parameters[i].index] = effect.parameters[i].value;
-        }
         const Picture picture = RoundTo(RandomPicture(random, 67, 9), GetFormat());
-        EXPECT_TRUE(PicturesAgree(OnDevice(effect, values, picture), picture, kExactly)) << effect.matchName;
+        EXPECT_TRUE(PicturesAgree(Apply(effect.matchName, ToParams(effect, {}), picture), picture, kExactly))
+            << effect.matchName;
+    }
+}
+
+TEST_P(EveryEffect, BadPicturesAndNumbersMakeNoNaN) {
+    // What needs more than a picture and parameters.
+    const std::set<const EffectRow*> left = {&kMotionEffect, &kOpacityEffect, &kStabilizerEffect, &kTrackMatteEffect};
+    constexpr float kLevels[] = {60000.0F, -60000.0F, 0.0F, 1.0F, -0.0F, 1e-7F, INFINITY, -INFINITY};
+    Picture finite = Plain(13, 6, {0.25, 0.5, 0.75, 1.0});
+    for (int i = 0; i < 6 * 8; ++i) {
+        float* const pixel = finite.At(i % 13, 1 + i / 13);
+        pixel[i % 3] = kLevels[i % 6];
+        pixel[(i + 1) % 3] = kLevels[i / 8];
+        pixel[3] = i % 5 == 0 ? 0.0F : 0.5F;
+    }
+    Picture endless = finite;
+    for (int i = 0; i < 8; ++i) endless.At(i, 0)[i % 3] = kLevels[6 + i % 2];
+    // A mix with infinite light, of which it takes nothing, has no value.
+    const std::set<const EffectRow*> mixes = {&kInvertEffect, &kDirectionalBlurEffect, &kLumaCurveEffect};
+    for (const EffectRow* effect : kEffectTable) {
+        if (left.count(effect) != 0 || !isRegistered(Halden::ToWide(effect->matchName), GetDevice())) continue;
+        const Picture picture = RoundTo(mixes.count(effect) != 0 ? finite : endless, GetFormat());
+        // Of many parameters most are points of curves, or the same for another range.
+        for (std::size_t i = 0; i<effect->parameterCount; i += effect->parameterCount> 30 ? 4 : 1) {
+            const ParameterRow& row = effect->parameters[i];
+            if (row.type == ParameterType::kBool || row.type == ParameterType::kColor) continue;
+            for (const double bad : {double{NAN}, double{INFINITY}, -1e9, 0.0, 1e9}) {
+                // A blend by no number gives none.
+                const bool isWhole = row.type == ParameterType::kInt || effect == &kInvertEffect;
+                if (isWhole && !std::isfinite(bad)) continue;
+                const ParameterValues values = {{row.index, {bad, bad}}};
+                const RenderNodeRef node = MakeEffect(effect->matchName, ToParams(*effect, values));
+                VideoFrameRef output;
+                // What would grow without end is refused.
+                TryRenderOver(node, MakePaddedFrame(GetDevice(), GetFormat(), picture, 2), output);
+                if (!output) continue;
+                const Picture result = DownloadFrame(GetDevice(), output);
+                const bool hasNaN = std::any_of(result.pixels.begin(), result.pixels.end(),
+                                                [](float value) { return std::isnan(value); });
+                EXPECT_FALSE(hasNaN) << effect->matchName << ", " << row.name << " " << bad;
+            }
+        }
+    }
+}
+
+TEST_P(EveryEffect, RefusedMemoryIsToldAndTheNextTrySucceeds) {
+    Random random;
+    const Picture picture = RoundTo(RandomPicture(random, 33, 6), GetFormat());
+    for (const EffectCase& effectCase : kCases) {
+        const EffectRow& effect = *FindEffect(effectCase.matchName);
+        const ParameterValues values = RandomValues(random, effect);
+        const RenderNodeRef node = MakeEffect(effect.matchName, ToParams(effect, values));
+        const auto render = [&] {
+            return DownloadFrame(GetDevice(), RenderOver(node, UploadFrame(GetDevice(), GetFormat(), picture)));
+        };
+        for (const auto& memory : {GetDevice()->GetDeviceMemory(), GetDevice()->GetHostMemory()}) {
+            int allocations = 0;
+            const VideoFrameRef input = UploadFrame(GetDevice(), GetFormat(), picture);
+            memory->SetAllocationFilter([&](std::uint64_t) { return ++allocations < 0; });
+            const Picture expected = DownloadFrame(GetDevice(), RenderOver(node, input));
+            for (int refused = 1; refused <= allocations; ++refused) {
+                const VideoFrameRef untouched = UploadFrame(GetDevice(), GetFormat(), picture);
+                int count = 0;  // of each try
+                memory->SetAllocationFilter([&](std::uint64_t) { return count++ % refused == refused - 1; });
+                VideoFrameRef output;
+                const Status status = TryRenderOver(node, untouched, output);
+                memory->SetAllocationFilter({});
+                SCOPED_TRACE(testing::Message() << effect.matchName << ", allocation " << refused);
+                // What the first try has kept, the second doesn't ask for again.
+                EXPECT_TRUE(status == Ostrand::kStatus_OutOfMemory || (refused > 1 && !Ostrand::Failed(status)));
+                EXPECT_EQ(!output, Ostrand::Failed(status));
+                EXPECT_TRUE(PicturesAgree(DownloadFrame(GetDevice(), output ? output : untouched),
+                                          output ? expected : picture, kExactly));
+                EXPECT_TRUE(PicturesAgree(render(), expected, kExactly));
+            }
+            memory->SetAllocationFilter({});
+        }
     }
 }
 

@@ -37,7 +37,7 @@ bool IsInside(const std::vector<Corner>& corners, double x, double y) {
 }
 
 TEST_P(GarbageMatteOnEachDevice, CoverageIsTheAreaInsideByTheEvenOddRule) {
-    const std::vector<std::vector<Corner>> outlines = {
+    std::vector<std::vector<Corner>> outlines = {
         {{3.5, 2.25}, {40.75, 6.5}, {30, 21}, {8, 15.3}},                              // convex
         {{2, 2}, {45, 20}, {45, 2}, {2, 20}},                                          // a bow tie
         {{2, 10}, {90, 10.4}, {2, 10.4}, {90, 10}},                                    // crossing at a small angle
@@ -47,23 +47,11 @@ TEST_P(GarbageMatteOnEachDevice, CoverageIsTheAreaInsideByTheEvenOddRule) {
         {{-50, -20}, {200, 11}, {-50, 40}, {60, 12}},                                  // beyond the frame
         {{10.2, 3.1}, {10.3, 20}, {10.5, 20}, {10.4, 3.1}},                            // a hair
         {{33, 0}, {64, 0}, {64, 24}, {33, 24}},                                        // on pixels
-        {{1, 1},
-         {9, 22},
-         {12, 3},
-         {19, 21},
-         {23, 2},
-         {30, 20},
-         {33, 4},
-         {40, 23},
-         {47, 1},
-         {52, 21},
-         {58, 5},
-         {63, 18},
-         {70, 2},
-         {80, 22},
-         {88, 3},
-         {50, 12}},  // 16
     };
+    outlines.emplace_back();  // teeth, of sixteen corners
+    for (int i = 0; i < 15; ++i)
+        outlines.back().push_back({1.0 + 6.2 * i, i % 2 == 0 ? 1.0 + 0.2 * i : 22.0 - 0.1 * i});
+    outlines.back().push_back({50, 12});
     constexpr int kFine = 32;
     const Picture in = Plain(96, 24, {-0.5, 2.0, 0.25, 1.0});
     for (std::size_t k = 0; k < outlines.size(); ++k) {
@@ -83,36 +71,6 @@ TEST_P(GarbageMatteOnEachDevice, CoverageIsTheAreaInsideByTheEvenOddRule) {
             }
         }
     }
-}
-
-TEST_P(GarbageMatteOnEachDevice, PixelsWhollyInsideKeepTheirBitsAndThoseOutsideAreClear) {
-    Random random;
-    SCOPED_TRACE(random.GetSeed());
-    const Picture in = RoundTo(RandomPicture(random, 75, 30), GetFormat());
-    Picture expected = in;
-    for (int y = 0; y < in.height; ++y) {
-        for (int x = 0; x < in.width; ++x) {
-            if (x < 7 || x >= 61 || y < 4 || y >= 26) expected.At(x, y)[3] = 0.0F;
-        }
-    }
-    EXPECT_TRUE(PicturesAgree(Masked({{7, 4}, {61, 4}, {61, 26}, {7, 26}}, in), expected, kExactly));
-    EXPECT_TRUE(PicturesAgree(Masked({{61, 26}, {61, 4}, {7, 4}, {7, 26}}, in), expected, kExactly)) << "either way";
-}
-
-TEST_P(GarbageMatteOnEachDevice, CornersThatAreNoPlacesDoNoHarm) {
-    const double endless = INFINITY, none = NAN;
-    const std::vector<std::vector<Corner>> outlines = {{{none, 3}, {20, none}, {20, 20}, {3, 20}},
-                                                       {{endless, 3}, {20, -endless}, {20, 20}, {3, 20}},
-                                                       {{1e30, 1e30}, {-1e30, 5}, {2, 2}, {9, 9}},
-                                                       {{5, 5}, {5, 5}, {5, 5}, {5, 5}},
-                                                       {{1e8, -1e8}, {1e8, 1e8}, {-1e8, 1e8}, {-1e8, -1e8}}};
-    Picture in = Plain(40, 20, {0.5, 0.5, 0.5, 1});
-    in.At(3, 3)[3] = static_cast<float>(endless);
-    for (const auto& outline : outlines) {
-        const Picture out = Masked(outline, in);
-        for (const float value : out.pixels) ASSERT_FALSE(std::isnan(value));
-    }
-    EXPECT_TRUE(PicturesAgree(Masked(outlines.back(), in), in, kExactly)) << "a polygon far around the frame";
 }
 
 INSTANTIATE_TEST_SUITE_P(Devices, GarbageMatteOnEachDevice, ::testing::ValuesIn(AllDeviceCases()), NameOfCase);

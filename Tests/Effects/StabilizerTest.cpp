@@ -143,7 +143,6 @@ protected:
 TEST_P(Stabilizer, AgreesWithAScalarOneOnTheSceneBehindEachFrame) {
     EXPECT_TRUE(isRegistered(u"TQ.XQVE SubspaceStabilizer", GetDevice()));
     Random random;
-    SCOPED_TRACE(random.GetSeed());
     for (int i = 0; i < 24; ++i) {
         Analyse(random.Int(40, 120), random.Int(30, 70), kShakes);
         const int index = random.Int(0, 4), framing = i % 3;

@@ -215,8 +215,7 @@ protected:
 
     void RenderTwice(const std::string& key) {
         const Figures before = Rest();
-        SCOPED_TRACE(testing::Message() << Script(key) << "; " << mSize.width << " by " << mSize.height << ", seed "
-                                        << mRandom.GetSeed());
+        SCOPED_TRACE(testing::Message() << Script(key) << "; " << mSize.width << " by " << mSize.height);
         for (Outcome& outcome : mOutcomes) {
             if (const RenderNodeRef tree = MakeTree(key)) Render(tree, outcome);
             const Figures after = Rest();

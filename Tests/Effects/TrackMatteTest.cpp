@@ -97,7 +97,7 @@ protected:
 TEST_P(TrackMatteOnEachDevice, AgreesWithTheScalarVersionAlsoAtAnotherSize) {
     Random random;
     for (int i = 0; i < 40; ++i) {
-        SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed() << ", round " << i);
+        SCOPED_TRACE(i);
         const bool byLuma = random.Chance(0.5F), reverse = random.Chance(0.5F), sameSize = random.Chance(0.4F);
         const Picture in = RoundTo(RandomPicture(random, random.Int(1, 150), random.Int(1, 30)), GetFormat());
         const Picture matte = RoundTo(

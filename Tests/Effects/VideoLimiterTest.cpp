@@ -11,7 +11,6 @@ using VideoLimiterOnEachDevice = EffectTest;
 
 TEST_P(VideoLimiterOnEachDevice, WhatComesOutLiesWithinTheLimitsAndWhatDidKeepsItsBits) {
     Random random;
-    SCOPED_TRACE(random.GetSeed());
     Picture in = RandomPicture(random, 61, 7);
     const float extremes[] = {60000.0F, -60000.0F, INFINITY, -INFINITY};
     for (int i = 0; i < 24; ++i) in.At(i, 0)[i % 3] = extremes[i / 6];

@@ -56,13 +56,13 @@ FakeRequest MakeClipRequest(std::uint32_t clipID, const VantrelClipRecord& recor
 }  // namespace
 
 void FakeHostEntries::FillSegmentLists(CorvaneVideoSegmentSuite& suite) {
-    suite.ReleaseVideoSegments = [](std::uint32_t id) -> VantrelHostStatus {
+    suite.ReleaseVideoSegments = [](auto id) {
         const Call call("ReleaseVideoSegments");
         if (!call.host.FindList(id, "ReleaseVideoSegments")) return kFails;
         call.host.mLists.erase(id);
         return 0;
     };
-    suite.GetSegmentsHash = [](std::uint32_t id, char* hashText) -> VantrelHostStatus {
+    suite.GetSegmentsHash = [](auto id, auto* hashText) {
         const Call call("GetSegmentsHash");
         if (!call.host.FindList(id, "GetSegmentsHash")) return kFails;
         const FakeSequence& sequence = call.host.sequences[call.host.mLists[id].timelineID];
@@ -70,15 +70,14 @@ void FakeHostEntries::FillSegmentLists(CorvaneVideoSegmentSuite& suite) {
         WriteText(sequence.hash.ToString(), hashText);
         return 0;
     };
-    suite.GetSegmentCount = [](std::uint32_t id, std::int32_t* count) -> VantrelHostStatus {
+    suite.GetSegmentCount = [](auto id, auto* count) {
         const Call call("GetSegmentCount");
         const auto* list = call.host.FindList(id, "GetSegmentCount");
         if (!list) return kFails;
         *count = static_cast<std::int32_t>(list->size());
         return 0;
     };
-    suite.GetSegmentInfo = [](std::uint32_t id, std::int32_t index, std::int64_t* start, std::int64_t* end,
-                              std::int64_t* offset, char* hashText) -> VantrelHostStatus {
+    suite.GetSegmentInfo = [](auto id, auto index, auto* start, auto* end, auto* offset, auto* hashText) {
         const Call call("GetSegmentInfo");
         const auto* list = call.host.FindList(id, "GetSegmentInfo");
         if (!list || index < 0 || static_cast<std::size_t>(index) >= list->size()) return kFails;
@@ -89,7 +88,7 @@ void FakeHostEntries::FillSegmentLists(CorvaneVideoSegmentSuite& suite) {
         WriteText(segment.hash.ToString(), hashText);
         return 0;
     };
-    suite.AcquireSegmentNode = [](std::uint32_t id, const char* hashText, std::uint32_t* node) -> VantrelHostStatus {
+    suite.AcquireSegmentNode = [](auto id, auto* hashText, auto* node) {
         const Call call("AcquireSegmentNode");
         const auto* list = call.host.FindList(id, "AcquireSegmentNode");
         if (!list) return kFails;
@@ -100,9 +99,8 @@ void FakeHostEntries::FillSegmentLists(CorvaneVideoSegmentSuite& suite) {
         }
         return kFails;
     };
-    suite.GetSequenceInfo = [](std::uint32_t timelineID, std::int32_t* left, std::int32_t* top, std::int32_t* right,
-                               std::int32_t* bottom, std::int32_t* numerator, std::int32_t* denominator,
-                               std::int64_t* ticksPerFrame, std::uint32_t* fieldType) -> VantrelHostStatus {
+    suite.GetSequenceInfo = [](auto timelineID, auto* left, auto* top, auto* right, auto* bottom, auto* numerator,
+                               auto* denominator, auto* ticksPerFrame, auto* fieldType) {
         const Call call("GetSequenceInfo");
         const auto found = call.host.sequences.find(timelineID);
         if (found == call.host.sequences.end() || found->second.infoFails) return kFails;
@@ -117,24 +115,22 @@ void FakeHostEntries::FillSegmentLists(CorvaneVideoSegmentSuite& suite) {
         *fieldType = sequence.fieldType;
         return 0;
     };
-    suite.AcquireVideoSegments = [](std::uint32_t timelineID, const char*, std::uint32_t* id) -> VantrelHostStatus {
+    suite.AcquireVideoSegments = [](auto timelineID, auto*, auto* id) {
         const Call call("AcquireVideoSegments");
         return call.host.OpenSegments(timelineID, false, id);
     };
-    suite.AcquireVideoSegmentsWithPreviews = [](std::uint32_t timelineID, const char*,
-                                                std::uint32_t* id) -> VantrelHostStatus {
+    suite.AcquireVideoSegmentsWithPreviews = [](auto timelineID, auto*, auto* id) {
         const Call call("AcquireVideoSegmentsWithPreviews");
         return call.host.OpenSegments(timelineID, true, id);
     };
-    suite.AcquireNestedVideoSegmentsWithPreviews = [](std::uint32_t timelineID, const char*,
-                                                      std::uint32_t* id) -> VantrelHostStatus {
+    suite.AcquireNestedVideoSegmentsWithPreviews = [](auto timelineID, auto*, auto* id) {
         const Call call("AcquireNestedVideoSegmentsWithPreviews");
         return call.host.OpenSegments(timelineID, true, id);
     };
 }
 
 void FakeHostEntries::FillNodes(CorvaneVideoSegmentSuite& suite) {
-    suite.ReleaseNode = [](std::uint32_t id) -> VantrelHostStatus {
+    suite.ReleaseNode = [](auto id) {
         const Call call("ReleaseNode");
         int& references = call.host.mReferences[id];
         if (references <= 0) {
@@ -144,7 +140,7 @@ void FakeHostEntries::FillNodes(CorvaneVideoSegmentSuite& suite) {
         --references;
         return 0;
     };
-    suite.GetNodeInfo = [](std::uint32_t id, char* kind, char* hash, std::uint32_t* flags) -> VantrelHostStatus {
+    suite.GetNodeInfo = [](auto id, auto* kind, auto* hash, auto* flags) {
         const Call call("GetNodeInfo");
         const FakeNode* node = call.host.FindNode(id, "GetNodeInfo");
         if (!node || node->infoFails) return kFails;
@@ -153,15 +149,14 @@ void FakeHostEntries::FillNodes(CorvaneVideoSegmentSuite& suite) {
         *flags = node->flags;
         return 0;
     };
-    suite.GetInputCount = [](std::uint32_t id, std::int32_t* count) -> VantrelHostStatus {
+    suite.GetInputCount = [](auto id, auto* count) {
         const Call call("GetInputCount");
         const FakeNode* node = call.host.FindNode(id, "GetInputCount");
         if (!node) return kFails;
         *count = static_cast<std::int32_t>(node->inputs.size());
         return 0;
     };
-    suite.AcquireInputNode = [](std::uint32_t id, std::int32_t index, std::int64_t* offset,
-                                std::uint32_t* input) -> VantrelHostStatus {
+    suite.AcquireInputNode = [](auto id, auto index, auto* offset, auto* input) {
         const Call call("AcquireInputNode");
         const FakeNode* node = call.host.FindNode(id, "AcquireInputNode");
         if (!node || index < 0 || static_cast<std::size_t>(index) >= node->inputs.size()) return kFails;
@@ -170,21 +165,21 @@ void FakeHostEntries::FillNodes(CorvaneVideoSegmentSuite& suite) {
         *input = scripted.node == 0 ? 0 : call.host.Acquire(scripted.node, "AcquireInputNode");
         return 0;
     };
-    suite.GetOperatorCount = [](std::uint32_t id, std::int32_t* count) -> VantrelHostStatus {
+    suite.GetOperatorCount = [](auto id, auto* count) {
         const Call call("GetOperatorCount");
         const FakeNode* node = call.host.FindNode(id, "GetOperatorCount");
         if (!node) return kFails;
         *count = static_cast<std::int32_t>(node->operators.size());
         return 0;
     };
-    suite.AcquireOperatorNode = [](std::uint32_t id, std::int32_t index, std::uint32_t* out) -> VantrelHostStatus {
+    suite.AcquireOperatorNode = [](auto id, auto index, auto* out) {
         const Call call("AcquireOperatorNode");
         const FakeNode* node = call.host.FindNode(id, "AcquireOperatorNode");
         if (!node || index < 0 || static_cast<std::size_t>(index) >= node->operators.size()) return kFails;
         *out = call.host.Acquire(node->operators[static_cast<std::size_t>(index)], "AcquireOperatorNode");
         return 0;
     };
-    suite.GetProperty = [](std::uint32_t id, const char* key, char** text) -> VantrelHostStatus {
+    suite.GetProperty = [](auto id, auto* key, auto* text) {
         const Call call("GetProperty");
         const FakeNode* node = call.host.FindNode(id, "GetProperty");
         if (!node) return kFails;
@@ -194,18 +189,16 @@ void FakeHostEntries::FillNodes(CorvaneVideoSegmentSuite& suite) {
         ++call.host.mLiveTexts;
         return 0;
     };
-    suite.GetParam = [](std::uint32_t id, std::int32_t index, std::int64_t ticks,
-                        VantrelParamRecord* record) -> VantrelHostStatus {
+    suite.GetParam = [](auto id, auto index, auto ticks, auto* record) {
         const Call call("GetParam");
         return call.host.ReadParam(id, index, ticks, record);
     };
-    suite.GetNextKeyframeTime = [](std::uint32_t id, std::int32_t index, std::int64_t ticks, std::int64_t* next,
-                                   std::int32_t* keyframe) -> VantrelHostStatus {
+    suite.GetNextKeyframeTime = [](auto id, auto index, auto ticks, auto* next, auto* keyframe) {
         const Call call("GetNextKeyframeTime");
         *keyframe = 0;
         return call.host.FindKeyframe(id, index, ticks, next);
     };
-    suite.TransformTime = [](std::uint32_t id, std::int64_t ticks, std::int64_t* transformed) -> VantrelHostStatus {
+    suite.TransformTime = [](auto id, auto ticks, auto* transformed) {
         const Call call("TransformTime");
         const FakeNode* node = call.host.FindNode(id, "TransformTime");
         if (!node) return kFails;
@@ -216,11 +209,9 @@ void FakeHostEntries::FillNodes(CorvaneVideoSegmentSuite& suite) {
 
 void FakeHostEntries::FillRenders(CorvaneVideoSegmentRenderSuite& suite) {
     using Kind = FakeRequest::Kind;
-    suite.RenderNode = [](std::uint32_t sequence, std::uint32_t node, std::int64_t time, std::int64_t nodeTime,
-                          std::int64_t frameTicks, std::int32_t width, std::int32_t height, std::int32_t numerator,
-                          std::int32_t denominator, const VantrelRenderDescription* description,
-                          VantrelRenderCallback callback, void* context,
-                          std::uint32_t* requestID) -> VantrelHostStatus {
+    suite.RenderNode = [](auto sequence, auto node, auto time, auto nodeTime, auto frameTicks, auto width, auto height,
+                          auto numerator, auto denominator, auto* description, auto callback, auto* context,
+                          auto* requestID) {
         Call call("RenderNode");
         call.host.FindNode(node, "RenderNode");
         const FakeRequest request = MakeRequest(Kind::kNode, sequence, node, 0, 0, time, nodeTime, frameTicks,
@@ -228,10 +219,8 @@ void FakeHostEntries::FillRenders(CorvaneVideoSegmentRenderSuite& suite) {
         call.lock.unlock();
         return call.host.Render(request, callback, context, requestID);
     };
-    suite.GetNodeFrameHash = [](std::uint32_t sequence, std::uint32_t node, std::int64_t time, std::int64_t nodeTime,
-                                std::int64_t frameTicks, std::int32_t width, std::int32_t height,
-                                std::int32_t numerator, std::int32_t denominator,
-                                const VantrelRenderDescription* description, char* text) -> VantrelHostStatus {
+    suite.GetNodeFrameHash = [](auto sequence, auto node, auto time, auto nodeTime, auto frameTicks, auto width,
+                                auto height, auto numerator, auto denominator, auto* description, auto* text) {
         const Call call("GetNodeFrameHash");
         const FakeNode* scripted = call.host.FindNode(node, "GetNodeFrameHash");
         if (!scripted) return kFails;
@@ -239,11 +228,9 @@ void FakeHostEntries::FillRenders(CorvaneVideoSegmentRenderSuite& suite) {
                                                 {width, height}, {numerator, denominator}, description),
                                     scripted->frameHashText, scripted->frameHashStatus, text);
     };
-    suite.RenderOperators = [](std::uint32_t sequence, std::uint32_t clip, std::int32_t first, std::int32_t end,
-                               std::int64_t time, std::int64_t rawTime, std::int64_t frameTicks, std::int32_t width,
-                               std::int32_t height, std::int32_t numerator, std::int32_t denominator, std::uint32_t,
-                               const VantrelRenderDescription* description, VantrelRenderCallback callback,
-                               void* context, std::uint32_t* requestID) -> VantrelHostStatus {
+    suite.RenderOperators = [](auto sequence, auto clip, auto first, auto end, auto time, auto rawTime, auto frameTicks,
+                               auto width, auto height, auto numerator, auto denominator, auto, auto* description,
+                               auto callback, auto* context, auto* requestID) {
         Call call("RenderOperators");
         call.host.FindNode(clip, "RenderOperators");
         const FakeRequest request = MakeRequest(Kind::kOperators, sequence, clip, first, end, time, rawTime, frameTicks,
@@ -251,11 +238,9 @@ void FakeHostEntries::FillRenders(CorvaneVideoSegmentRenderSuite& suite) {
         call.lock.unlock();
         return call.host.Render(request, callback, context, requestID);
     };
-    suite.GetOperatorsFrameHash = [](std::uint32_t sequence, std::uint32_t clip, std::int32_t first, std::int32_t end,
-                                     std::int64_t time, std::int64_t rawTime, std::int64_t frameTicks,
-                                     std::int32_t width, std::int32_t height, std::int32_t numerator,
-                                     std::int32_t denominator, std::uint32_t,
-                                     const VantrelRenderDescription* description, char* text) -> VantrelHostStatus {
+    suite.GetOperatorsFrameHash = [](auto sequence, auto clip, auto first, auto end, auto time, auto rawTime,
+                                     auto frameTicks, auto width, auto height, auto numerator, auto denominator, auto,
+                                     auto* description, auto* text) {
         const Call call("GetOperatorsFrameHash");
         const FakeNode* scripted = call.host.FindNode(clip, "GetOperatorsFrameHash");
         if (!scripted) return kFails;
@@ -263,38 +248,34 @@ void FakeHostEntries::FillRenders(CorvaneVideoSegmentRenderSuite& suite) {
                                                 {width, height}, {numerator, denominator}, description),
                                     scripted->frameHashText, scripted->frameHashStatus, text);
     };
-    suite.CancelRequest = [](std::uint32_t requestID) -> VantrelHostStatus {
+    suite.CancelRequest = [](auto requestID) {
         const Call call("CancelRequest");
         return call.host.Cancel(requestID);
     };
 }
 
 void FakeHostEntries::FillClips(CorvaneVideoSegmentRenderSuite& suite) {
-    suite.GetClipFormat = [](std::uint32_t clipID, std::int64_t, const VantrelClipRecord* wanted,
-                             VantrelClipRecord* delivered) -> VantrelHostStatus {
+    suite.GetClipFormat = [](auto clipID, auto, auto* wanted, auto* delivered) {
         const Call call("GetClipFormat");
         const auto found = call.host.clips.find(clipID);
         if (found == call.host.clips.end()) return kFails;
         *delivered = found->second.deliver ? found->second.deliver(*wanted) : *wanted;
         return 0;
     };
-    suite.RenderClip = [](std::uint32_t clipID, const VantrelClipRecord* record, std::int64_t time,
-                          VantrelRenderCallback callback, void* context,
-                          std::uint32_t* requestID) -> VantrelHostStatus {
+    suite.RenderClip = [](auto clipID, auto* record, auto time, auto callback, auto* context, auto* requestID) {
         Call call("RenderClip");
         if (call.host.clips.count(clipID) == 0) return kFails;
         call.lock.unlock();
         return call.host.Render(MakeClipRequest(clipID, *record, time), callback, context, requestID);
     };
-    suite.GetClipFrameHash = [](std::uint32_t clipID, const VantrelClipRecord* record, std::int64_t time,
-                                char* text) -> VantrelHostStatus {
+    suite.GetClipFrameHash = [](auto clipID, auto* record, auto time, auto* text) {
         const Call call("GetClipFrameHash");
         const auto found = call.host.clips.find(clipID);
         if (found == call.host.clips.end()) return kFails;
         return call.host.AnswerHash(MakeClipRequest(clipID, *record, time), found->second.frameHashText,
                                     found->second.frameHashStatus, text);
     };
-    suite.IsClipReady = [](std::uint32_t clipID, std::uint8_t* ready) -> VantrelHostStatus {
+    suite.IsClipReady = [](auto clipID, auto* ready) {
         const Call call("IsClipReady");
         const auto found = call.host.clips.find(clipID);
         if (found == call.host.clips.end()) return kFails;
@@ -310,20 +291,20 @@ void FakeHostEntries::FillSmallSuites(LarkspurMemoryManagerSuite& memory, Larksp
         if (--call.host.mLiveTexts < 0) ADD_FAILURE() << "more texts are freed than were given out";
         std::free(text);
     };
-    glaze.Dispose = [](Glaze* frame) -> VantrelHostStatus {
+    glaze.Dispose = [](auto* frame) {
         const Call call("Dispose");
         if (DisposeFakeGlaze(frame)) return 0;
         ADD_FAILURE() << "a picture is disposed of twice";
         return kFails;
     };
-    cache.Find = [](const char* hashText, Glaze** frame) -> VantrelHostStatus {
+    cache.Find = [](auto* hashText, auto* frame) {
         const Call call("Find");
         const auto found = call.host.glazeCache.find(hashText);
         if (found == call.host.glazeCache.end()) return kFails;
         *frame = NewFakeGlaze(found->second);
         return 0;
     };
-    opaque.Acquire = [](std::int32_t instance, void** data) -> VantrelHostStatus {
+    opaque.Acquire = [](auto instance, auto* data) {
         const Call call("Acquire");
         const auto found = call.host.opaqueData.find(instance);
         if (found == call.host.opaqueData.end()) return kFails;
@@ -331,7 +312,7 @@ void FakeHostEntries::FillSmallSuites(LarkspurMemoryManagerSuite& memory, Larksp
         *data = found->second;
         return 0;
     };
-    opaque.Release = [](std::int32_t instance, std::uint8_t* disposed) -> VantrelHostStatus {
+    opaque.Release = [](auto instance, auto* disposed) {
         const Call call("Release");
         if (--call.host.mAcquiredOpaqueData[instance] < 0) {
             ADD_FAILURE() << "opaque data of instance " << instance << " is released more often than acquired";

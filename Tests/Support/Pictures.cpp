@@ -13,18 +13,6 @@
 namespace Vantrel::Testing {
 namespace {
 
-std::uint32_t ChooseSeed() {
-    if (const char* text = std::getenv("VANTREL_TEST_SEED")) {
-        if (std::string_view(text) == "new") return std::random_device{}();
-        return static_cast<std::uint32_t>(std::strtoul(text, nullptr, 0));
-    }
-    const testing::TestInfo* const test = testing::UnitTest::GetInstance()->current_test_info();
-    const std::string name = test ? std::string(test->test_suite_name()) + '.' + test->name() : std::string();
-    std::uint32_t seed = 2166136261U;  // FNV-1a: the same with every library
-    for (const char c : name) seed = (seed ^ static_cast<unsigned char>(c)) * 16777619U;
-    return seed;
-}
-
 /// Is it further from the expectation than the limit? Infinities agree with themselves only.
 bool Exceeds(double actual, double expected, double limit) {
     if (std::isnan(actual) || std::isnan(expected)) return std::isnan(actual) != std::isnan(expected);
@@ -47,7 +35,17 @@ struct Worst {
 
 }  // namespace
 
-Random::Random() : Random(ChooseSeed()) {}
+std::uint32_t Random::ChooseSeed() {
+    if (const char* text = std::getenv("VANTREL_TEST_SEED")) {
+        if (std::string_view(text) == "new") return std::random_device{}();
+        return static_cast<std::uint32_t>(std::strtoul(text, nullptr, 0));
+    }
+    const testing::TestInfo* const test = testing::UnitTest::GetInstance()->current_test_info();
+    const std::string name = test ? std::string(test->test_suite_name()) + '.' + test->name() : std::string();
+    std::uint32_t seed = 2166136261U;  // FNV-1a: the same with every library
+    for (const char c : name) seed = (seed ^ static_cast<unsigned char>(c)) * 16777619U;
+    return seed;
+}
 
 Picture RandomPicture(Random& random, int width, int height) {
     Picture picture(width, height);

@@ -3,6 +3,7 @@
 #pragma once
 
 #include <cstdint>
+#include <optional>
 #include <random>
 #include <string>
 #include <vector>
@@ -19,11 +20,11 @@ using Host::Software::Picture;
 using Host::Software::Pixel;
 
 /// Numbers that differ from test to test and are the same in every run, so that a failure can be had again.
-/// VANTREL_TEST_SEED in the environment sets another seed, "new" one that nobody has tried; a failing test should show
-/// GetSeed in its trace.
+/// VANTREL_TEST_SEED in the environment sets another seed, "new" one that nobody has tried; what fails meanwhile tells
+/// it.
 class Random {
 public:
-    Random();
+    Random() : Random(ChooseSeed()) { mTrace.emplace(__FILE__, __LINE__, "seed " + std::to_string(mSeed)); }
     explicit Random(std::uint32_t seed) : mSeed(seed), mEngine(seed) {}
 
     [[nodiscard]] std::uint32_t GetSeed() const { return mSeed; }
@@ -33,10 +34,12 @@ public:
     [[nodiscard]] bool Chance(float probability) { return Unit() < probability; }
 
 private:
+    [[nodiscard]] static std::uint32_t ChooseSeed();
     [[nodiscard]] float Unit() { return static_cast<float>(mEngine() >> 8) / 16777216.0F; }
 
     std::uint32_t mSeed;
     std::mt19937 mEngine;
+    std::optional<testing::ScopedTrace> mTrace;
 };
 
 /// Noise: colours from below 0 to above 1, alpha 0, 1 and between, but for the least that a division would make huge.

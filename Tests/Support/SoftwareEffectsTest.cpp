@@ -54,50 +54,6 @@ TEST(SoftwareBlend, GivesTheValuesOfThePublishedFormulas) {
     }
 }
 
-TEST(SoftwareBlend, KnowsEveryModeByNameAndFallsBackToNormal) {
-    for (std::int32_t mode = 0; mode < Kiln::kBlend_Count; ++mode) {
-        ASSERT_NE(Kiln::GetBlendModeName(mode), nullptr);
-        EXPECT_EQ(Kiln::FindBlendMode(Kiln::GetBlendModeName(mode)), mode);
-    }
-    EXPECT_EQ(Kiln::FindBlendMode("color_burn"), Kiln::kBlend_ColorBurn);
-    EXPECT_EQ(Kiln::FindBlendMode("divide"), 26);
-    EXPECT_EQ(Kiln::FindBlendMode("colour"), -1);
-    EXPECT_EQ(Kiln::GetBlendModeName(27), nullptr);
-    EXPECT_EQ(Kiln::GetBlendModeName(-1), nullptr);
-    EXPECT_EQ(BlendColor(99, {0.1, 0.1, 0.1, 1}, {0.3, 0.4, 0.5, 1}), (Pixel{0.3, 0.4, 0.5, 1}));
-}
-
-TEST(SoftwareMotion, TurnsClockwiseAboutTheAnchorAndCoversHalfPixels) {
-    // A red mark in the layer's upper left corner, turned by 90 degrees clockwise, stands in the upper right one.
-    Picture layer(3, 3);
-    Fill(layer, 0, 0, 3, 3, {0, 0, 0, 1});
-    layer.Set(0, 0, {0, 0, 1, 1});
-    Picture target(3, 3);
-    LayerDrawing drawing;
-    drawing.rotation = 90.0F;
-    DrawLayer(layer, drawing, target);
-    EXPECT_EQ(target.Get(2, 0), (Pixel{0, 0, 1, 1}));
-    EXPECT_EQ(target.Get(0, 0), (Pixel{0, 0, 0, 1}));
-
-    // Half a pixel to the right: its left column covers half of the first pixels.
-    target = Picture(3, 3);
-    drawing.rotation = 0.0F;
-    drawing.positionX = 0.5F + 0.5F / 3.0F;
-    DrawLayer(layer, drawing, target);
-    EXPECT_NEAR(target.Get(0, 1)[3], 0.5, 1e-6);
-    EXPECT_EQ(target.Get(1, 1)[3], 1.0);
-
-    // A source pixel twice as wide as the target's: the layer spreads over six columns.
-    target = Picture(8, 3);
-    drawing.positionX = 0.5F;
-    drawing.layerAspect = {2, 1};
-    DrawLayer(layer, drawing, target);
-    EXPECT_EQ(target.Get(0, 1)[3], 0.0);
-    EXPECT_EQ(target.Get(1, 1)[3], 1.0);
-    EXPECT_EQ(target.Get(6, 1)[3], 1.0);
-    EXPECT_EQ(target.Get(7, 1)[3], 0.0);
-}
-
 TEST(SoftwareConvert, MeetsTheAnchorsOfVideoLevels) {
     // 75 % bars of BT.601 and BT.709 in 8 bits, V U Y A: white, then yellow and blue; from the recommendations'
     // matrices.
