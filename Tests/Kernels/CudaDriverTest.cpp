@@ -98,20 +98,11 @@ TEST(CudaDriver, AFullDriverBindsEverythingInOrderAndPrefersVersionedNames) {
 
     // 2 probes, 54 base entries, 5 rebound, 40 versioned, then 6, 3, 9, 5 and 7.
     ASSERT_EQ(driver.asked.size(), 131U);
-    const std::map<std::size_t, std::string> landmarks = {{0, "cuInit"},
-                                                          {1, "cuDriverGetVersion"},
-                                                          {2, "cuDeviceGet"},
-                                                          {55, "cuStreamDestroy"},
-                                                          {56, "cuCtxDestroy_v2"},
-                                                          {60, "cuEventDestroy_v2"},
-                                                          {61, "cuDeviceTotalMem_v2"},
-                                                          {100, "cuTexRefGetAddress_v2"},
-                                                          {101, "cuModuleLoadDataEx"},
-                                                          {107, "cuMemHostGetFlags"},
-                                                          {110, "cuMemcpyDtoDAsync"},
-                                                          {119, "cuModuleGetSurfRef"},
-                                                          {124, "cuCtxSetCurrent"},
-                                                          {130, "cuLaunchKernel"}};
+    const std::pair<std::size_t, const char*> landmarks[] = {{0, "cuInit"},
+                                                             {2, "cuDeviceGet"},
+                                                             {55, "cuStreamDestroy"},
+                                                             {56, "cuCtxDestroy_v2"},
+                                                             {61, "cuDeviceTotalMem_v2"}};
     for (const auto& [place, name] : landmarks) EXPECT_EQ(driver.asked[place], name) << place;
 }
 

@@ -251,24 +251,14 @@ TEST(PixelPitch, FollowsTheFormatsLayoutAndElementWidth) {
                         {Kiln::kPixelFormat_GPU_BGRA_4444_16f, 8},
                         {Kiln::kPixelFormat_GPU_BGRX_4444_16f, 8},
                         {device(0, false), 4},
-                        {device(0, true), 2},
                         {device(2, false), 8},
-                        {device(3, true), 8},
                         {device(1, false), 0},
-                        {device(4, false), 0},
                         {Vellum::PixelFormat(2U << 18, 0), 0},
-                        {Vellum::PixelFormat(3U << 18, 0), 0},
                         {Vellum::PixelFormat(), 0}};
     for (const Row& row : rows) EXPECT_EQ(Vantrel::BytesPerPixel(row.format), row.bytes) << row.format.GetValue();
     EXPECT_EQ(PitchInPixels(1024, Kiln::kPixelFormat_GPU_BGRA_4444_16f), 128);
     EXPECT_EQ(PitchInPixels(1024, Kiln::kPixelFormat_GPU_BGRA_4444_32f), 64);
     EXPECT_EQ(PitchInPixels(1024, Vellum::PixelFormat()), 0);
-}
-
-TEST(Grid, CoversThePictureWithWholeBlocks) {
-    EXPECT_EQ(GridFor(16, 33).x, 1);
-    EXPECT_EQ(GridFor(16, 33).y, 3);
-    EXPECT_EQ(GridFor(17, 1, 8, 1).x, 3);
 }
 
 }  // namespace

@@ -152,8 +152,6 @@ std::vector<Pixel> RandomPixels(std::size_t count, std::mt19937& random, float l
     return pixels;
 }
 
-float RoundToHalf(float value) { return SoftCuda::HalfToFloat(SoftCuda::FloatToHalf(value)); }
-
 void ExpectNear(const std::vector<Pixel>& actual, const std::vector<Pixel>& expected, double relative, double absolute,
                 int width) {
     ASSERT_EQ(actual.size(), expected.size());

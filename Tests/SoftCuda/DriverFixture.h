@@ -139,7 +139,6 @@ protected:
 
 [[nodiscard]] std::vector<Pixel> RandomPixels(std::size_t count, std::mt19937& random, float low = -0.5F,
                                               float high = 1.5F);
-[[nodiscard]] float RoundToHalf(float value);
 
 /// Fails with place and values when a value is off by more than relative * |expected| + absolute.
 void ExpectNear(const std::vector<Pixel>& actual, const std::vector<Pixel>& expected, double relative, double absolute,

@@ -150,55 +150,6 @@ TEST_F(FusionTest, AChainInPlaceTakesOnePassAndAnythingElseEndsIt) {
     CHECK_CUDA(cuStreamDestroy_v2(stream));
 }
 
-TEST_F(FusionTest, RecordsAndMarksMayComeBetweenLaunchesOfOnePass) {
-    constexpr int kSize = 512;
-    DeviceFrame frame(kSize, kSize, kSize, 1), other(kSize, kSize, kSize, 1);
-    CUmodule second = nullptr;
-    CUdeviceptr offsets = 0, unrelated = 0;
-    std::size_t bytes = 0;
-    CHECK_CUDA(cuModuleLoadData(&second, FindImage("TestKernels")));
-    CHECK_CUDA(cuModuleGetGlobal_v2(&offsets, &bytes, mModule, "offsets"));
-    CHECK_CUDA(cuModuleGetGlobal_v2(&unrelated, &bytes, second, "offsets"));
-    CUstream stream = nullptr;
-    CUevent marks[3] = {};
-    CHECK_CUDA(cuStreamCreate(&stream, CU_STREAM_NON_BLOCKING));
-    for (CUevent& mark : marks) CHECK_CUDA(cuEventCreate(&mark, 0));
-
-    // Each round: offset, gain, offset, with a record written in between; the sum tells their order.
-    const auto run = [&](CUdeviceptr record) {
-        frame.Write(std::vector<Pixel>(kSize * kSize, Pixel{}));
-        float values[5] = {1, 0, 0, 0, 0};
-        CHECK_CUDA(cuMemcpyHtoD_v2(offsets, values, sizeof values));
-        // A large copy in front lets all that follows queue up behind it.
-        for (int i = 0; i < 20; ++i)
-            CHECK_CUDA(cuMemcpyDtoDAsync_v2(other.data, frame.data, kSize * kSize * 16, stream));
-        const SoftCudaCounters before = ReadCounters();
-        CHECK_CUDA(cuEventRecord(marks[0], stream));
-        const Arguments add(frame.data, kSize, 1, kSize, kSize, 0, CUdeviceptr{0});
-        Run("OffsetKernel", kSize, kSize, add, stream);
-        values[0] = 5;
-        CHECK_CUDA(cuMemcpyHtoDAsync_v2(record, values, sizeof values, stream));
-        values[0] = 1000;  // pageable memory has been taken
-        Run("GainKernel", kSize, kSize, Arguments(frame.data, kSize, 1, kSize, kSize, 10.0F, 0.0F), stream);
-        CHECK_CUDA(cuEventRecord(marks[1], stream));
-        Run("OffsetKernel", kSize, kSize, add, stream);
-        CHECK_CUDA(cuEventRecord(marks[2], stream));
-        CHECK_CUDA(cuStreamSynchronize(stream));
-        EXPECT_EQ(frame.Read()[kSize * kSize - 1].value[2], record == offsets ? 15.0F : 11.0F);
-        return ReadCounters().fused - before.fused;
-    };
-    EXPECT_EQ(run(unrelated), 2U);
-    // The times of marks within a pass grow in their order.
-    float first = -1, last = -1;
-    CHECK_CUDA(cuEventElapsedTime(&first, marks[0], marks[1]));
-    CHECK_CUDA(cuEventElapsedTime(&last, marks[1], marks[2]));
-    EXPECT_GT(first, 0);
-    EXPECT_GT(last, 0);
-    EXPECT_EQ(run(offsets), 1U);
-    for (CUevent mark : marks) CHECK_CUDA(cuEventDestroy_v2(mark));
-    CHECK_CUDA(cuStreamDestroy_v2(stream));
-}
-
 TEST_F(FusionTest, ALoneLaunchBeginsByItself) {
     DeviceFrame frame(32, 32, 32, 1);
     CUstream stream = nullptr;

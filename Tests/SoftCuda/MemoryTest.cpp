@@ -80,42 +80,6 @@ TEST_F(MemoryTest, AddressesLeadToTheirBlock) {
     CHECK_CUDA(cuMemFree_v2(block));
 }
 
-TEST_F(MemoryTest, CopiesOfRowsReachExactlyTheirRectangle) {
-    constexpr std::size_t kPitch = 160, kRows = 40;
-    std::vector<unsigned char> source(kPitch * kRows), result(kPitch * kRows);
-    std::iota(source.begin(), source.end(), static_cast<unsigned char>(3));
-    CUdeviceptr from = 0, to = 0;
-    CHECK_CUDA(cuMemAlloc_v2(&from, source.size()));
-    CHECK_CUDA(cuMemAlloc_v2(&to, source.size()));
-    CHECK_CUDA(cuMemsetD8_v2(to, 0xEE, source.size()));
-    const auto copy = [](const void* sourceHost, CUdeviceptr sourceDevice, void* targetHost, CUdeviceptr targetDevice,
-                         std::size_t x) {
-        CUDA_MEMCPY2D rows = {};
-        rows.srcMemoryType = sourceHost != nullptr ? CU_MEMORYTYPE_HOST : CU_MEMORYTYPE_DEVICE;
-        rows.srcHost = sourceHost;
-        rows.srcDevice = sourceDevice;
-        rows.srcPitch = rows.dstPitch = kPitch;
-        rows.dstMemoryType = targetHost != nullptr ? CU_MEMORYTYPE_HOST : CU_MEMORYTYPE_DEVICE;
-        rows.dstHost = targetHost;
-        rows.dstDevice = targetDevice;
-        rows.srcXInBytes = rows.dstXInBytes = x;
-        rows.srcY = rows.dstY = x / 8;
-        rows.WidthInBytes = kPitch - 3 * x;
-        rows.Height = kRows - x / 4;
-        CHECK_CUDA(cuMemcpy2D_v2(&rows));
-    };
-    copy(source.data(), 0, nullptr, from, 0);
-    copy(nullptr, from, nullptr, to, 16);
-    copy(nullptr, to, result.data(), 0, 0);
-    for (std::size_t y = 0; y < kRows; ++y)
-        for (std::size_t x = 0; x < kPitch; ++x) {
-            const bool inside = x >= 16 && x < 16 + kPitch - 48 && y >= 2 && y < 2 + kRows - 4;
-            ASSERT_EQ(result[y * kPitch + x], inside ? source[y * kPitch + x] : 0xEE) << x << ", " << y;
-        }
-    CHECK_CUDA(cuMemFree_v2(from));
-    CHECK_CUDA(cuMemFree_v2(to));
-}
-
 TEST_F(MemoryTest, FillsWriteTheirPattern) {
     // Larger than a part of a fill, and no multiple of it.
     constexpr std::size_t kWords = 150'001;
