@@ -17,7 +17,7 @@ protected:
     using Params = std::map<std::int32_t, FakeParam>;
 
     FrameLeafRef Leaf(const Pixel& color, int width = 64, int height = 36) {
-        return FrameLeafRef(new FrameLeaf(Frame(Solid(width, height, color))));
+        return FrameLeafRef(new FrameLeaf(Frame(Plain(width, height, color))));
     }
     /// A picture with the clip's opacity below its motion.
     RenderNodeRef Layer(const RenderNodeRef& picture, bool withOpacity = true, bool withMotion = true) {
@@ -38,14 +38,10 @@ protected:
         for (std::size_t i = 0; i < layers.size(); ++i) node->SetInput(i, layers[i]);
         return node;
     }
-    Pixel PixelOf(const VideoFrameRef& frame, int x, int y) { return Download(frame).Get(x, y); }
-    static void ExpectPixel(const Pixel& actual, const Pixel& expected) {
-        for (std::size_t c = 0; c < 4; ++c) EXPECT_NEAR(actual[c], expected[c], 2e-3) << "channel " << c;
-    }
     /// Leaves frames of the output's size in the pool that aren't empty: what isn't cleared shows.
     void PoisonPool() {
-        const VideoFrameRef first = Frame(Solid(64, 36, {0.7, 0.7, 0.7, 0.7}));
-        const VideoFrameRef second = Frame(Solid(64, 36, {0.7, 0.7, 0.7, 0.7}));
+        const VideoFrameRef first = Frame(Plain(64, 36, {0.7, 0.7, 0.7, 0.7}));
+        const VideoFrameRef second = Frame(Plain(64, 36, {0.7, 0.7, 0.7, 0.7}));
     }
 
 private:
@@ -104,24 +100,6 @@ TEST_P(CompositorDevice, WhatNoLayerCoversIsTransparent) {
     ExpectPixel(corner({}, 32, 18), clear);
     ExpectPixel(corner({{1, 120.0F}}), kRed);
     ExpectPixel(corner({{1, 100.0F}, {2, 150.0F}, {3, std::uint8_t{0}}}), kRed);
-}
-
-TEST_P(CompositorDevice, ALayersOriginAndClipFrameMoveIt) {
-    // A picture that begins 16 pixels into the output's left.
-    const FrameLeafRef leaf = Leaf(kRed, 32, 36);
-    leaf->frame->SetOrigin({-16, 0});
-    const Picture picture = Download(Render(*Composite({leaf})));
-    ExpectPixel(picture.Get(0, 20), {0.0, 0.0, 0.0, 0.0});
-    ExpectPixel(picture.Get(20, 20), kRed);
-    ExpectPixel(picture.Get(63, 20), {0.0, 0.0, 0.0, 0.0});
-
-    // Grown by an effect from 64 to 96 pixels: the anchor at the clip's left edge is the clip's, not the frame's.
-    SetMotion({{0, FakePoint{0.5, 0.5}}, {5, FakePoint{0.0, 0.5}}});
-    const FrameLeafRef grown = Leaf(kRed, 96, 36);
-    grown->frame->SetOrigin({16, 0});
-    const Picture moved = Download(Render(*Composite({Layer(grown)})));
-    ExpectPixel(moved.Get(14, 20), {0.0, 0.0, 0.0, 0.0});
-    ExpectPixel(moved.Get(18, 20), kRed);
 }
 
 TEST_P(CompositorDevice, DisabledLayersDontCount) {
@@ -217,18 +195,6 @@ TEST_P(IntrinsicDevice, MoreInputsOrNoneFail) {
     EXPECT_EQ(Render(*layer, frame), Ostrand::kStatus_Failure);
     EXPECT_EQ(leaf->renders, 0);
     EXPECT_EQ(Render(*Layer({}, false, true), frame), Ostrand::kStatus_Failure);
-}
-
-TEST_P(IntrinsicDevice, RefusedMemoryIsTriedAgain) {
-    SetMotion({{1, 50.0F}});
-    const RenderNodeRef layer = Layer(Leaf(kRed));
-    CountAllocations([](int number) { return number == 1; });
-    ExpectPixel(PixelOf(Render(*layer), 32, 18), kRed);
-    EXPECT_EQ(allocations, 2);
-    layer->EndFrame({}, script.params, results, 0);
-    CountAllocations([](int) { return true; });
-    VideoFrameRef frame;
-    EXPECT_EQ(Render(*layer, frame), Ostrand::kStatus_Failure);
 }
 
 INSTANTIATE_TEST_SUITE_P(OnEachDevice, CompositorDevice, testing::ValuesIn(AllDeviceCases()), NameOfCase);

@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <gtest/gtest.h>
 
+#include <sstream>
+
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/MediaNode.h"
 #include "Src/Filters/SWHostRenderClipPrefetch.h"
@@ -23,6 +25,15 @@ using ClipMedia = ProxyNode<MediaNode, Upload>;
 class MediaChain : public HostedTest {
 protected:
     InterfaceRef<ClipMedia> MakeMedia() { return script.Make<ClipMedia>(MediaScript::Media(), device); }
+    /// The usual properties of the media, and some as "key=value key=value".
+    void SetMedia(const std::string& text) {
+        host.nodes[MediaScript::kMedia].properties = mUsual;
+        std::istringstream words(text);
+        for (std::string word; words >> word;) {
+            const std::size_t end = word.find('=');
+            script.Set({{"MediaNode::" + word.substr(0, end), word.substr(end + 1)}});
+        }
+    }
     /// The names of the sources between the media node and its upload.
     std::string Sources() {
         std::string names;
@@ -42,56 +53,48 @@ protected:
     MediaScript script{host};
     boost::shared_ptr<FakeDevice> device = boost::make_shared<FakeDevice>();
     RenderNodeRef selected;
+
+private:
+    const MediaScript::Properties mUsual = host.nodes[MediaScript::kMedia].properties;
 };
 
 TEST_F(MediaChain, HasOnlyTheSourcesThatTheMediaNeeds) {
     const struct {
-        MediaScript::Properties media;
+        const char* media;
         const char* sources;
         std::uint32_t fieldType = 0;  ///< of the sequence
     } kRows[] = {
-        {{}, "ScaleSource "},
-        {{{"ClipSpeed", "0.5"}}, "TimeSampleSource ScaleSource "},
-        {{{"ClipBackwards", "1"}}, "TimeSampleSource ScaleSource "},
-        {{{"StreamFrameRate", "400"}}, "TimeSampleSource ScaleSource "},
-        {{{"StreamInvertAlpha", "1"}}, "ScaleSource InvertAlphaSource "},
-        {{{"StreamInvertAlpha", "1"}, {"StreamIgnoreAlpha", "1"}}, "ScaleSource "},
-        {{{"RemoveFlicker", "1"}}, "ScaleSource RemoveFlickerSource "},
-        {{{"StreamFieldType", "1"}}, "ScaleSource FieldReverseSource ", 2},
-        {{{"StreamFieldType", "1"}, {"StreamReverseFieldDominance", "1"}},
-         "ScaleSource ReverseFieldDominanceSource ",
-         2},
+        {"", "ScaleSource "},
+        {"ClipSpeed=0.5", "TimeSampleSource ScaleSource "},
+        {"ClipBackwards=1", "TimeSampleSource ScaleSource "},
+        {"StreamFrameRate=400", "TimeSampleSource ScaleSource "},
+        {"StreamInvertAlpha=1", "ScaleSource InvertAlphaSource "},
+        {"StreamInvertAlpha=1 StreamIgnoreAlpha=1", "ScaleSource "},
+        {"RemoveFlicker=1", "ScaleSource RemoveFlickerSource "},
+        {"StreamFieldType=1", "ScaleSource FieldReverseSource ", 2},
+        {"StreamFieldType=1 StreamReverseFieldDominance=1", "ScaleSource ReverseFieldDominanceSource ", 2},
         // Backwards and reversed cancel each other.
-        {{{"StreamFieldType", "1"}, {"StreamReverseFieldDominance", "1"}, {"ClipBackwards", "1"}},
-         "TimeSampleSource ScaleSource FieldReverseSource ",
+        {"StreamFieldType=1 StreamReverseFieldDominance=1 ClipBackwards=1",
+         "TimeSampleSource ScaleSource FieldReverseSource ", 2},
+        {"StreamFieldType=1 DeinterlaceAlways=1", "TimeSampleSource ScaleSource DeinterlaceSource FieldReverseSource ",
          2},
-        // A reduced picture is resampled anyway.
-        {{{"StreamFieldType", "1"}, {"ClipScaleToFramePolicy", "1"}, {"StreamFrameHeight", "72"}}, "ScaleSource ", 2},
-        {{{"StreamFieldType", "1"}, {"DeinterlaceAlways", "1"}},
-         "TimeSampleSource ScaleSource DeinterlaceSource FieldReverseSource ",
-         2},
-        {{{"StreamFieldType", "1"},
-          {"DeinterlaceAlways", "1"},
-          {"StreamRemovePulldown", "1"},
-          {"StreamPullDownCadence", "1"}},
-         "TimeSampleSource ScaleSource ",
-         2},
-        // Two fields merge into a frame.
-        {{{"StreamFieldType", "1"}, {"StreamFrameBlend", "1"}}, "TimeSampleSource ScaleSource "},
+        {"StreamFieldType=1 DeinterlaceAlways=1 StreamRemovePulldown=1 StreamPullDownCadence=1",
+         "TimeSampleSource ScaleSource ", 2},
+        // A reduced picture is resampled anyway, and two fields merge into a frame.
+        {"StreamFieldType=1 ClipScaleToFramePolicy=1 StreamFrameHeight=72", "ScaleSource ", 2},
+        {"StreamFieldType=1 StreamFrameBlend=1", "TimeSampleSource ScaleSource "},
     };
-    const auto usual = host.nodes[MediaScript::kMedia].properties;
     for (const auto& row : kRows) {
-        host.nodes[MediaScript::kMedia].properties = usual;
-        for (const auto& [key, value] : row.media) script.Set({{"MediaNode::" + key, value}});
+        SetMedia(row.media);
         script.params.fieldType = row.fieldType;
-        EXPECT_EQ(Sources(), row.sources) << ::testing::PrintToString(row.media);
+        EXPECT_EQ(Sources(), row.sources) << row.media;
     }
-    host.nodes[MediaScript::kMedia].properties = usual;
+    SetMedia("");
     script.params.fieldType = 0;
     host.nodes[MediaScript::kClip].properties["ClipNode::TimeRemapping"] = "x";
     EXPECT_EQ(Sources(), "TimeSampleSource ScaleSource ");
     host.nodes[MediaScript::kMedia].flags = kNodeFlag_Still;
-    script.Set({{"MediaNode::InterlaceConsecutiveFrames", "1"}, {"MediaNode::StreamFrameBlend", "1"}});
+    SetMedia("InterlaceConsecutiveFrames=1 StreamFrameBlend=1");
     EXPECT_EQ(Sources(), "ScaleSource ") << "a still has no time";
 }
 
@@ -282,46 +285,34 @@ protected:
 
 TEST_F(TimeSamples, FollowRatesBlendingAndFields) {
     const struct {
-        const char* what;
-        const char* rate;  ///< of the stream, whose sequence has 1000 ticks a frame
-        const char* blend;
-        std::int64_t clipTime;
-        std::string samples;
+        const char* media;
+        std::int64_t clipTime;  ///< of a sequence with 1000 ticks a frame
+        const char* samples;
         std::uint32_t quality = 2, sequenceField = 0, selection = Vellum::kFieldSelection_Frame;
-        MediaScript::Properties more = {};
     } kRows[] = {
-        {"the nearest frame", "1250", "0", 1000, "1250: 1250*1@0; "},
-        {"3000 lies nearer to 2500", "1250", "0", 3000, "2500: 2500*1@0; "},
-        {"drafts aren't blended", "1250", "1", 3000, "2500: 2500*1@0; ", 1},
-        {"from the content's start", "1250", "0", 1000, "13750: 13750*1@0; ", 2, 0, 2, {{"ContentStart", "12500"}}},
-        {"slower: the two around the moment", "1250", "1", 1000, "0: 0*0.2@0; 1250: 1250*0.8@0; "},
-        {"on a frame", "1250", "1", 2500, "2500: 2500*1@0; "},
-        {"faster: all that it lasts", "400", "1", 1000, "800: 800*0.2@0; 1200: 1200*0.4@0; 1600: 1600*0.4@0; "},
-        {"twice as fast", "1000", "1", 1000, "1000: 1000*0.5@0; 2000: 2000*0.5@0; ", 2, 0, 2, {{"ClipSpeed", "2"}}},
-        {"two fields make a frame",
-         "1000",
-         "1",
-         1000,
-         "1000: 1000*0.5@0 1500*0.5@0; ",
-         2,
-         0,
-         2,
-         {{"StreamFieldType", "1"}}},
-        {"the lower field comes first", "500", "0", 3000, "3000: 3000*1@2; 3500: 3500*1@1; ", 2, 2},
-        {"both fields show the same frame", "1500", "0", 3000, "3000: 3000*1@0; ", 2, 2},
-        {"the first field alone", "500", "0", 3000, "3000: 3000*1@0; ", 2, 2, 0},
-        {"the second, whose request has moved already", "500", "0", 3500, "3500: 3500*1@0; ", 2, 2, 1},
+        {"StreamFrameRate=1250", 1000, "1250: 1250*1@0; "},
+        {"StreamFrameRate=1250", 3000, "2500: 2500*1@0; "},  // the nearer one
+        {"StreamFrameRate=1250 StreamFrameBlend=1", 3000, "2500: 2500*1@0; ", 1},
+        {"StreamFrameRate=1250 ContentStart=12500", 1000, "13750: 13750*1@0; "},
+        // Slower than the sequence: the two around the moment; faster: all that it lasts.
+        {"StreamFrameRate=1250 StreamFrameBlend=1", 1000, "0: 0*0.2@0; 1250: 1250*0.8@0; "},
+        {"StreamFrameRate=1250 StreamFrameBlend=1", 2500, "2500: 2500*1@0; "},
+        {"StreamFrameRate=400 StreamFrameBlend=1", 1000, "800: 800*0.2@0; 1200: 1200*0.4@0; 1600: 1600*0.4@0; "},
+        {"ClipSpeed=2 StreamFrameBlend=1", 1000, "1000: 1000*0.5@0; 2000: 2000*0.5@0; "},
+        {"StreamFieldType=1 StreamFrameBlend=1", 1000, "1000: 1000*0.5@0 1500*0.5@0; "},
+        // Fields of the sequence are moments of their own, of which one may show the same frame as the other.
+        {"StreamFrameRate=500", 3000, "3000: 3000*1@2; 3500: 3500*1@1; ", 2, 2},
+        {"StreamFrameRate=1500", 3000, "3000: 3000*1@0; ", 2, 2},
+        {"StreamFrameRate=500", 3000, "3000: 3000*1@0; ", 2, 2, 0},
+        {"StreamFrameRate=500", 3500, "3500: 3500*1@0; ", 2, 2, 1},
     };
-    const auto usual = host.nodes[MediaScript::kMedia].properties;
     for (const auto& row : kRows) {
-        host.nodes[MediaScript::kMedia].properties = usual;
-        script.Set({{"MediaNode::StreamFrameRate", row.rate}, {"MediaNode::StreamFrameBlend", row.blend}});
-        for (const auto& [key, value] : row.more) script.Set({{"MediaNode::" + key, value}});
+        SetMedia(row.media);
         script.params.clipTime = row.clipTime;
         script.params.quality = row.quality;
         script.params.sequenceFieldType = row.sequenceField;
         script.params.fieldSelection = row.selection;
-        EXPECT_EQ(Ask(), row.samples) << row.what;
+        EXPECT_EQ(Ask(), row.samples) << row.media << " at " << row.clipTime;
     }
 }
 

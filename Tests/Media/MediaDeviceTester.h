@@ -79,12 +79,12 @@ protected:
     }
     Picture Download(const VideoFrameRef& frame) { return DownloadFrame(GetDevice(), frame); }
     VideoFrameRef Frame(const Picture& picture) { return UploadFrame(GetDevice(), WorkingFormat(), picture); }
-    static Picture Solid(int width, int height, const Pixel& color) {
-        Picture picture(width, height);
-        for (int y = 0; y < height; ++y) {
-            for (int x = 0; x < width; ++x) picture.Set(x, y, color);
-        }
-        return picture;
+    Pixel PixelOf(const VideoFrameRef& frame, int x = 0, int y = 0) { return Download(frame).Get(x, y); }
+    static void ExpectPixel(const Pixel& actual, const Pixel& expected) {
+        for (std::size_t c = 0; c < 4; ++c) EXPECT_NEAR(actual[c], expected[c], 2e-3) << "channel " << c;
+    }
+    void ExpectPixel(const VideoFrameRef& frame, const Pixel& expected, int x = 0, int y = 0) {
+        ExpectPixel(PixelOf(frame, x, y), expected);
     }
     /// Counts the device's allocations from here on; those for which `refuse`, given the number so far, says so fail.
     void CountAllocations(std::function<bool(int)> refuse = {}) {

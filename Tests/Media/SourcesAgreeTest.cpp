@@ -44,7 +44,6 @@ protected:
     }
 
     Random random;
-    testing::ScopedTrace mTrace{__FILE__, __LINE__, "seed " + std::to_string(random.GetSeed())};
 };
 
 INSTANTIATE_TEST_SUITE_P(OnEachDevice, SourcesAgree, testing::ValuesIn(AllDeviceCases()), NameOfCase);
@@ -71,21 +70,6 @@ TEST_P(SourcesAgree, FlickerRemovalLeavesFlatFieldsToTheBit) {
             Plain(random.Int(1, 90), random.Int(1, 40),
                   {random.Uniform(-1, 2), random.Uniform(-1, 2), random.Uniform(0, 1), round % 3 == 0 ? 1.0 : alpha}));
         EXPECT_TRUE(PicturesAgree(Through<RemoveFlickerSource>(flat), flat, kExactly)) << round;
-    }
-}
-
-TEST_P(SourcesAgree, PicturesAreScaledToTheOutput) {
-    // Draft quality takes single pixels, at whose edges rounding decides.
-    script.params.quality = 3;
-    for (int round = 0; round < 12; ++round) {
-        const Picture in = RandomSize(8);
-        script.params.outputRect = {0, 0, random.Int(4, 200), random.Int(4, 90)};
-        Picture expected(script.params.outputRect.Width(), script.params.outputRect.Height());
-        const float scaleX = static_cast<float>(expected.width) / static_cast<float>(in.width);
-        const float scaleY = static_cast<float>(expected.height) / static_cast<float>(in.height);
-        Host::Software::Resample(in, expected, scaleX, scaleY, Vellum::ToRenderQuality(script.params.quality));
-        EXPECT_TRUE(PicturesAgree(Through<ScaleSource>(in), expected, {IsHalf() ? 3e-3 : 3e-4, 0.0, true, 0.005}))
-            << round;
     }
 }
 

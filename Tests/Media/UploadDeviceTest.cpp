@@ -50,11 +50,6 @@ protected:
         EXPECT_EQ(node.RequestHostFrames(script.params, results), 0);
         return MediaDeviceTest::Render(node);
     }
-    Pixel PixelOf(const VideoFrameRef& frame, int x = 0, int y = 0) { return Download(frame).Get(x, y); }
-    void ExpectPixel(const VideoFrameRef& frame, const Pixel& expected, int x = 0, int y = 0) {
-        const Pixel actual = PixelOf(frame, x, y);
-        for (std::size_t c = 0; c < 4; ++c) EXPECT_NEAR(actual[c], expected[c], 1e-3) << "channel " << c;
-    }
 };
 
 TEST_P(UploadDevice, AHostFrameComesThroughConverted) {

@@ -4,10 +4,8 @@
 
 #include "Src/Nodes/MultipleTimeInputBaseNode.h"
 #include "Src/Nodes/SelectInputBaseNode.h"
-#include "Src/Nodes/SourceBaseNode.h"
 #include "Src/Nodes/TransformRenderParamsBaseNode.h"
 #include "Tests/Nodes/ProbeNodes.h"
-#include "Tests/Support/HostedTest.h"
 
 namespace Vantrel::Testing {
 namespace {
@@ -138,50 +136,6 @@ TEST(MultipleTimeInput, EveryPhaseGoesThroughAllSamplesAsFieldsOrFrames) {
     EXPECT_EQ(node->CollectHostFrames(stage.params, stage.results, {}), Ostrand::kStatus_Failure);
     EXPECT_EQ(node->EndFrame({}, stage.params, stage.results, 2), 0);
     EXPECT_THAT(stage.log, ElementsAre("leaf CollectHostFrames", "leaf EndFrame 2", "leaf EndFrame 2"));
-}
-
-class Link : public SourceBaseNode<FilterNode>, public Ostrand::Allocated<Link> {
-protected:
-    std::atomic<std::int32_t>& GetRef() override { return mRefCount; }
-};
-
-class ProgressiveLink final : public Link {
-public:
-    Vellum::FrameRate GetFieldRate() override { return GetFrameRate(); }
-};
-
-class SourceChainTest : public HostedTest {
-protected:
-    VideoNodeRef Media(const char* fieldType) {
-        host.nodes[1].kind = "Clip";
-        host.nodes[1].inputs = {{2}};
-        host.nodes[2].kind = "Media";
-        host.nodes[2].properties = {{"MediaNode::StreamFrameRate", "1000"}, {"MediaNode::StreamFieldType", fieldType}};
-        return GetClipMedia(AcquireRoot(host));
-    }
-    ProbeStage stage;
-};
-
-TEST_F(SourceChainTest, RatesComeFromTheLastLinkWhichReadsTheMedia) {
-    const struct {
-        const char* fieldType;
-        std::int64_t frameTicks;
-        std::int64_t fieldTicks;
-    } kCases[] = {{"0", 1000, 1000}, {"1", 1000, 500}, {"2", 1000, 500}, {"4", 2000, 2000}};
-    for (const auto& expected : kCases) {
-        const auto last = stage.Configured(InterfaceRef<Link>(new Link), Media(expected.fieldType));
-        const InterfaceRef<Link> middle(new Link);
-        const InterfaceRef<ProgressiveLink> head(new ProgressiveLink);
-        last->SetInput(0, stage.Leaf("producer"));
-        middle->SetInput(0, last);
-        head->SetInput(0, middle);
-        EXPECT_EQ(middle->GetFrameRate().GetTicksPerFrame(), expected.frameTicks) << expected.fieldType;
-        EXPECT_EQ(middle->GetFieldRate().GetTicksPerFrame(), expected.fieldTicks) << expected.fieldType;
-        EXPECT_EQ(head->GetFieldRate(), head->GetFrameRate()) << "no fields leave this link";
-        EXPECT_TRUE(head->GetFrameHash(stage.params, stage.results).IsNil());
-        const auto asSource = Ostrand::Query<ISourceNode>(RenderNodeRef(head));
-        EXPECT_EQ(Ostrand::Query<IRenderNode>(asSource).Get(), static_cast<IRenderNode*>(head.Get()));
-    }
 }
 
 }  // namespace

@@ -178,23 +178,5 @@ TEST_F(FilterNodeTest, TimingsAreWrittenForNamedNodesAboveAHundredthOfAMilliseco
     EXPECT_EQ(stream.str(), "node: 2.5ms\n") << "an unnamed node still visits its inputs";
 }
 
-TEST_F(FilterNodeTest, ANameComesFromTheDescription) {
-    class Effect final : public IdleFilter, public Ostrand::Allocated<Effect> {
-    public:
-        Effect() : IdleFilter(false, false) {}
-        std::atomic<std::int32_t>& GetRef() override { return mRefCount; }
-    };
-    FakeNode effect{"Effect"};
-    effect.properties["EffectNode::FilterMatchName"] = "TQ.XQVE Invert";
-    FakeNode transition{"Transition"};
-    transition.properties["TransitionNode::TransitionMatchName"] = "XQVE Push";
-    const auto named = [&](const FakeNode& description) {
-        return stage.Configured(InterfaceRef<Effect>(new Effect), Describe(description))->GetName();
-    };
-    EXPECT_EQ(named(effect), u"TQ.XQVE Invert");
-    EXPECT_EQ(named(transition), u"XQVE Push");
-    EXPECT_EQ(named({"Media"}), u"");
-}
-
 }  // namespace
 }  // namespace Vantrel::Testing

@@ -64,35 +64,6 @@ TEST(RenderNodeBase, AFailingInputStopsEveryWalkButCancelAndEnd) {
     EXPECT_THAT(stage.log, ElementsAre("a CancelHostFrames", "b CancelHostFrames", "a EndFrame 3", "b EndFrame 3"));
 }
 
-TEST(RenderNodeBase, TheLastInputWithAFrameWins) {
-    ProbeStage stage;
-    const BareNodeRef node(new BareNode);
-    for (std::size_t index = 0; index < 2; ++index) {
-        const ProbeLeafRef leaf = stage.Leaf("leaf");
-        leaf->frame = FakeFrame::Make();
-        node->SetInput(index, leaf);
-    }
-    VideoFrameRef frame;
-    EXPECT_EQ(stage.Render(*node, frame), 0);
-    VideoFrameRef second;
-    stage.Render(*node->GetInput(1), second);
-    EXPECT_EQ(frame, second);
-}
-
-TEST(RenderNodeBase, InterfacesAreAnsweredByIdentifierAndNodesDieWithTheirLastHolder) {
-    const std::int64_t live = Ostrand::Allocator::GetLiveBlocks();
-    {
-        const BareNodeRef node(new BareNode);
-        EXPECT_TRUE(Ostrand::Query<IRenderNode>(node));
-        EXPECT_TRUE(Ostrand::Query<RenderNodeBase>(node));
-        EXPECT_FALSE(Ostrand::Query<FilterNode>(node));
-        void* out = node.Get();
-        EXPECT_EQ(node->QueryInterface({1, 2, 3, {}}, &out), static_cast<Status>(0xA00A0001));
-        EXPECT_EQ(out, nullptr);
-    }
-    EXPECT_EQ(Ostrand::Allocator::GetLiveBlocks(), live);
-}
-
 TEST(RenderResults, StoresAreKeptAndTheLogGrowsAtItsHeadOncePerFrame) {
     RenderResults results;
     const VideoFrameRef first = FakeFrame::Make();

@@ -66,16 +66,6 @@ protected:
     Kiln::DeviceRef device;
 };
 
-TEST_P(RenderSystemTest, CallsNestAndTheFirstRecordStays) {
-    QuillBasicSuite empty{};  // calling its entries would crash
-    Initialize(&empty);
-    ScriptAMatte();
-    EXPECT_EQ(Create(kSequence)->GetTimelineHash(), host.sequences[kSequence].hash);
-    Terminate();
-    EXPECT_TRUE(Kiln::GetPrimaryDevice(GetParam())) << "one call is left";
-    EXPECT_EQ(host.Count("ReleaseSuite"), 0);
-}
-
 TEST_P(RenderSystemTest, AMatteRendersFromEndToEnd) {
     ScriptAMatte();
     const auto system = Create(kSequence);

@@ -72,34 +72,6 @@ TEST_P(SolidColorTest, EachMatteFillsItsFrame) {
     }
 }
 
-TEST_P(SolidColorTest, TheFingerprintTellsWhatTheFrameDependsOn) {
-    const auto black = Matte(Media("1112293707"));
-    const auto hash = [&](const InterfaceRef<SolidColorNode>& node) { return node->GetFrameHash(params, results); };
-    const Guid first = hash(black);
-    params.time = params.clipTime = 5000;
-    EXPECT_EQ(hash(black), first) << "a matte doesn't move";
-    EXPECT_EQ(hash(Matte(Media("1129270354", {0, 0, 0, 0, 0, 0, 0, 0}))), first) << "the same colour";
-    EXPECT_NE(hash(Matte(Media("1414680150"))), first);
-    params.quality = 3;
-    EXPECT_NE(hash(black), first);
-    params.quality = 2;
-    params.outputRect.right += 1;
-    EXPECT_NE(hash(black), first);
-}
-
-TEST_P(SolidColorTest, ARefusedFrameIsTriedAgain) {
-    int asked = 0;
-    Kiln::MemoryManager& memory = *GetDevice()->GetDeviceMemory();
-    memory.SetAllocationFilter([&asked](std::uint64_t) { return ++asked == 1; });
-    EXPECT_EQ(Render(Matte(Media("1112293707"))), 0);
-    EXPECT_GE(asked, 2);
-    memory.SetAllocationFilter([](std::uint64_t) { return true; });
-    results = boost::make_shared<RenderResults>();
-    EXPECT_EQ(Render(Matte(Media("1112293707"))), Ostrand::kStatus_OutOfMemory);
-    EXPECT_FALSE(frame);
-    memory.SetAllocationFilter({});
-}
-
 INSTANTIATE_TEST_SUITE_P(, SolidColorTest, testing::ValuesIn(AllDeviceCases()), NameOfCase);
 
 }  // namespace

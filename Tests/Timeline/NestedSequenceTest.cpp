@@ -55,17 +55,6 @@ TEST_F(NestedSequence, ItsRangeFollowsOffsetAndSpeed) {
     EXPECT_EQ(trees[1].end, 800);
 }
 
-TEST_F(NestedSequence, TheMediasOwnTimeOffsetCounts) {
-    AddNode(30, "Disabled");
-    host.nodes[30].inputs = {{10, 30}};
-    host.sequences[kTop].segments.clear();
-    AddSegment(kTop, 100, 300, 30, 50);
-    Read();
-    const auto& trees = Probe(Probe(InfoAt(100).tree).inputs[0]).segmentTrees;
-    ASSERT_EQ(trees.size(), 1U) << "the inner 20..220";
-    EXPECT_EQ(InfoAt(100, true).offset, 20);
-}
-
 TEST_F(NestedSequence, WithoutANodeForItThePiecesGoIntoTheMaps) {
     unregistered.insert("NestedTimelineNode");
     const std::string tree = "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))";

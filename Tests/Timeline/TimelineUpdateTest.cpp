@@ -68,29 +68,6 @@ TEST_F(TimelineUpdate, AnUnchangedSequenceCostsOneHashCall) {
     EXPECT_EQ(host.Count("GetSegmentCount"), 1) << "without a hash there is no short cut";
 }
 
-TEST_F(TimelineUpdate, AMovedClipKeepsItsTreeAndLeavesBlackBehind) {
-    AddPlainClip(10);
-    AddPlainClip(11);
-    AddSegment(kTop, 0, 100, 10);
-    AddSegment(kTop, 100, 200, 11);
-    Read();
-    const RenderNodeRef moved = InfoAt(0).tree, still = InfoAt(100).tree;
-
-    host.sequences[kTop].segments[0] = {500, 600, 0, NumberedGuid(10), 10};
-    std::swap(host.sequences[kTop].segments[0], host.sequences[kTop].segments[1]);
-    ChangeAndUpdate();
-    EXPECT_TRUE(created.empty());
-    EXPECT_EQ(InfoAt(500).tree, moved);
-    EXPECT_EQ(InfoAt(100).tree, still);
-    EXPECT_EQ(Describe(InfoAt(0).tree), "BlackVideoSource");
-    EXPECT_EQ(Describe(InfoAt(300).tree), "BlackVideoSource");
-
-    // What stood unchanged wasn't in that update's cache, and yet it lives on where it stands.
-    ChangeAndUpdate();
-    EXPECT_TRUE(created.empty());
-    EXPECT_EQ(InfoAt(150).tree, still);
-}
-
 TEST_F(TimelineUpdate, MovingOneClipAmongManyBuildsNothingAndAsksForEachSegmentOnce) {
     constexpr int kSegments = 500;
     for (std::uint32_t i = 0; i < kSegments; ++i) {
