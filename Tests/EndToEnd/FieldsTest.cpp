@@ -95,34 +95,6 @@ TEST_P(Fields, AreTakenInTheOtherOrderOnDemand) {
     }
 }
 
-std::string OutputOf(const std::string& command) {
-    std::string text;
-    FILE* pipe = popen(command.c_str(), "r");
-    char line[256];
-    while (pipe && std::fgets(line, sizeof line, pipe)) text += line;
-    return pipe && pclose(pipe) == 0 ? text : "failed: " + command;
-}
-
-TEST(InterlacedFilms, SayInWhichOrderTheirFieldsCome) {
-    const Folder folder("vantrel-interlaced-films");
-    for (const char* extension : {"mp4", "mov", "mkv"}) {
-        for (const std::uint32_t order : {0U, 1U, 2U}) {
-            const std::string path = folder.Path("film" + std::to_string(order) + "." + extension);
-            WriteBarFilm(path, order, order);
-            const std::string frames = OutputOf(
-                "ffprobe -v error -select_streams v -show_entries "
-                "frame=interlaced_frame,top_field_first -of default=nw=1:nk=1 " +
-                path);
-            std::string expected;
-            for (int i = 0; i < kBarFrames; ++i) expected += order == 0 ? "0\n0\n" : order == 1 ? "1\n1\n" : "1\n0\n";
-            EXPECT_EQ(frames, expected) << path;
-            const MediaProbeResult probed = FFmpegProbe().ProbeFile(path);
-            ASSERT_TRUE(probed.info) << probed.error;
-            EXPECT_EQ(static_cast<std::uint32_t>(probed.info->fieldType), order) << path;
-        }
-    }
-}
-
 TEST(InterlacedFilms, KeepTheColorsOfTheirFieldsApart) {
     const Folder folder("vantrel-interlaced-colors");
     const auto pool = PixelBufferPool::Create();

@@ -6,7 +6,6 @@
 #include <utility>
 #include <vector>
 
-#include "Ostrand/CriticalSection.h"
 #include "Ostrand/QueryTable.h"
 
 using namespace Ostrand;
@@ -102,31 +101,4 @@ TEST(NullReferences, RaiseWhenUsed) {
     EXPECT_THROW((void)*none, NullInterfaceException);
     EXPECT_FALSE(Query<ISecond>(none));
     EXPECT_THROW((void)Demand<ISecond>(none), NullInterfaceException);
-}
-
-TEST(CriticalSections, NameTheirOutermostHolderAndExcludeOtherThreads) {
-    CriticalSection section("counter");
-    EXPECT_EQ(section.GetHolder(), nullptr);
-    {
-        const ScopedLock outer(section, "outer");
-        {
-            const ScopedLock inner(section);
-            EXPECT_STREQ(section.GetHolder(), "outer");
-        }
-        EXPECT_STREQ(section.GetHolder(), "outer");
-    }
-    EXPECT_EQ(section.GetHolder(), nullptr);
-
-    int count = 0;
-    std::vector<std::thread> threads;
-    for (int i = 0; i < 4; ++i) {
-        threads.emplace_back([&] {
-            for (int k = 0; k < 1000; ++k) {
-                const ScopedLock lock(section, "count");
-                ++count;
-            }
-        });
-    }
-    for (std::thread& thread : threads) thread.join();
-    EXPECT_EQ(count, 4000);
 }

@@ -95,15 +95,6 @@ TEST_P(EveryExecutor, MayLoseItsLastReferenceToItsOwnWork) {
     EXPECT_EQ(end.wait_for(std::chrono::seconds(60)), std::future_status::ready);
 }
 
-TEST_P(EveryExecutor, ReleasesWhatItsWorkHeldOnceItHasRun) {
-    const ExecutorRef executor = GetParam()();
-    auto held = std::make_shared<int>(1);
-    const std::weak_ptr<int> watch = held;
-    executor->Post([held = std::move(held)] {}, 0);
-    executor->Drain();
-    EXPECT_TRUE(watch.expired());
-}
-
 TEST_P(EveryExecutor, LeavesNoWorkBehindWhenTheProcessEnds) {
     testing::FLAGS_gtest_death_test_style = "threadsafe";
     const auto endWithWorkPosted = [] {

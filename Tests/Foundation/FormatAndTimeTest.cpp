@@ -95,11 +95,3 @@ TEST(PixelAspects, FollowAReductionThatDiffersByDirection) {
     EXPECT_EQ(adjust(Vellum::kPixelAspectRatio_Unknown, 720, 1080), Vellum::kPixelAspectRatio_Unknown);
     EXPECT_EQ(adjust(Vellum::kPixelAspectRatio_Any, 720, 1080), Vellum::kPixelAspectRatio_Any);
 }
-
-TEST(PixelAspects, StayCloseWhenTheirTermsOutgrow32Bits) {
-    const PixelAspectRatio aspect{1000003, 999983};
-    const Vellum::Rect stream{0, 0, 99991, 65537};
-    const Vellum::Rect frame{0, 0, 49999, 32749};
-    const double expected = aspect.Value() * (99991.0 / 49999.0) / (65537.0 / 32749.0);
-    EXPECT_NEAR(AdjustPixelAspectRatioForNonUniformDownsample(aspect, stream, frame).Value(), expected, 1e-8);
-}

@@ -46,14 +46,6 @@ TEST(GuidText, ThatIsMalformedGivesTheNilIdentifier) {
     EXPECT_TRUE(Guid(wide).IsNil());
 }
 
-TEST(GuidBytes, StandInTheOrderOfTheText) {
-    std::uint8_t bytes[16];
-    Guid::GuidToBytes(kSample, bytes);
-    const std::uint8_t expected[16] = {0x0A, 0x1B, 0x2C, 0x3D, 0x4E, 0x5F, 0x60, 0x71,
-                                       0x82, 0x93, 0xA4, 0xB5, 0xC6, 0xD7, 0xE8, 0xF9};
-    EXPECT_EQ(std::memcmp(bytes, expected, 16), 0);
-}
-
 TEST(WideText, ConvertsEveryLengthOfCharacterBothWays) {
     const std::string utf8 =
         "a\xC2\x80\xC3\xA9\xDF\xBF\xE0\xA0\x80\xED\x9F\xBF\xEE\x80\x80\xEF\xBF\xBF\xF0\x90\x80\x80"

@@ -41,19 +41,6 @@ TEST(Tracing, IsGatedByCategoryAndLevel) {
     EXPECT_FALSE(debug::TraceEnabled("Test.Levels", 0, 1));
 }
 
-TEST(Tracing, GateFollowsItsCategory) {
-    debug::TraceGate gate("Test.Gate", 10);
-    EXPECT_FALSE(gate.IsOpen());
-    debug::SetTraceLevel("Test.Gate", 10);
-    EXPECT_TRUE(gate.IsOpen());
-    debug::SetTraceLevel("Test.Other", 10);
-    EXPECT_TRUE(gate.IsOpen());
-    debug::SetTraceLevel("Test.Gate", 9);
-    EXPECT_FALSE(gate.IsOpen());
-    debug::SetTraceLevel("Test.Gate", -1);
-    debug::SetTraceLevel("Test.Other", -1);
-}
-
 TEST(Tracing, WritesWholeLinesFromManyThreads) {
     const CollectedLines lines;
     const debug::TraceGate gate("Test.Lines", 10);

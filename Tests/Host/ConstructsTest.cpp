@@ -99,20 +99,13 @@ TEST(Constructs, MediaTellTheirStream) {
     const SnapshotPtr snapshot = BuildSnapshot(document, {}, described.probe, HostServices::Instance().GetIdentities());
     const Node& clip = *snapshot->top->plain.segments.at(0).root->inputs.at(0).node;
     const Node& node = *clip.inputs.at(0).node;
-    const std::pair<const char*, std::string> expected[] = {{"StreamFrameWidth", "1280"},
-                                                            {"StreamFrameHeight", "720"},
-                                                            {"StreamFrameRate", "10160640000"},
-                                                            {"StreamAlphaType", "2"},
+    // What the samples' media don't have.
+    const std::pair<const char*, std::string> expected[] = {{"StreamAlphaType", "2"},
                                                             {"StreamAlphaMatteColor", "1056816"},
                                                             {"StreamFrameVidSubType", "1635148593"},
                                                             {"StartTimecodeOffset", std::to_string(86400 * kFrame)},
-                                                            {"ContentStart", "0"},
                                                             {"InPointMediaTimeAsTicks", std::to_string(10 * kFrame)},
-                                                            {"OutPointMediaTimeAsTicks", std::to_string(15 * kFrame)},
-                                                            {"ClipScaleToFramePolicy", "1"},
-                                                            {"MediaInstanceString", "/media/x.mov"},
-                                                            {"SelectedMulticamTrack", "(fails)"},
-                                                            {"NestedSequenceTimelineID", "(fails)"}};
+                                                            {"SelectedMulticamTrack", "(fails)"}};
     for (const auto& [key, value] : expected) EXPECT_EQ(Property(node, std::string("MediaNode::") + key), value) << key;
     EXPECT_TRUE(node.AsMedia()->samplesTime);
     EXPECT_EQ(snapshot->nativeSubType, info.codecTag);

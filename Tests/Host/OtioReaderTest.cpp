@@ -151,18 +151,6 @@ TEST(OtioReader, WhatIsNoTimelineIsWrapped) {
     EXPECT_TRUE(Described(Timeline({audio})).Segments().empty());
 }
 
-TEST(OtioReader, WarpsMultiplyAndAFreezeWins) {
-    const auto itemOf = [](std::vector<Json> warps) {
-        return Read(Timeline({Track({Clip("A", 0, 10, Effects(std::move(warps)))})})).tracks.children[0].children[0];
-    };
-    EXPECT_DOUBLE_EQ(itemOf({Warp(2.0), Warp(-0.25)}).speed, -0.5);
-    EXPECT_TRUE(itemOf({Warp(2.0), Freeze()}).freeze);
-    EXPECT_TRUE(itemOf({Warp(0.0)}).freeze);
-    Json off = Warp(3.0);
-    off["enabled"] = false;
-    EXPECT_DOUBLE_EQ(itemOf({off}).speed, 1.0);
-}
-
 TEST(OtioReader, ReferencesBecomePaths) {
     const auto fileOf = [](const std::string& url) {
         const Json media = {{"OTIO_SCHEMA", "ExternalReference.1"}, {"target_url", url}};

@@ -76,23 +76,6 @@ TEST(Suites, UnknownIdsAndNoTimelineFail) {
     EXPECT_EQ(Segments().ReleaseVideoSegments(hold.list), 0);
 }
 
-TEST(Suites, TellTheFormatOfASequence) {
-    const Published described(Timeline(
-        {Track({Clip("a", 0, 10)})},
-        Own({{"sequence", {{"width", 640}, {"height", 480}, {"rate", 29.97}, {"aspect", {8, 9}}, {"fields", 2}}}})));
-    std::int32_t left = 1, top = 1, right = 0, bottom = 0, numerator = 0, denominator = 0;
-    std::int64_t ticks = 0;
-    std::uint32_t fields = 0;
-    ASSERT_EQ(Segments().GetSequenceInfo(1, &left, &top, &right, &bottom, &numerator, &denominator, &ticks, &fields),
-              0);
-    EXPECT_EQ(left + top, 0);
-    EXPECT_EQ(right, 640);
-    EXPECT_EQ(bottom, 480);
-    EXPECT_EQ(numerator * 9, denominator * 8);
-    EXPECT_EQ(ticks, 8475667200);
-    EXPECT_EQ(fields, 2U);
-}
-
 TEST(Suites, OpaqueDataStayAsLongAsTheyAreHeld) {
     const auto timeline = [](const char* data) {
         Json effect = Effect("TQ.XQVE SubspaceStabilizer");

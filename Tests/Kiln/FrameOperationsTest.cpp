@@ -23,7 +23,6 @@ protected:
 
 TEST_P(FrameOperationsOnEachDevice, FillsARectangleAndNothingElse) {
     Random random;
-    SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed());
     const Picture before = Rounded(RandomPicture(random, 75, 30));
     const struct {
         int left, top, width, height;
@@ -55,7 +54,6 @@ TEST_P(FrameOperationsOnEachDevice, FillsARectangleAndNothingElse) {
 
 TEST_P(FrameOperationsOnEachDevice, ARectangleIsCopiedOrRefusedWhole) {
     Random random;
-    SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed());
     const Picture from = Rounded(RandomPicture(random, 40, 20));
     const Picture before = Rounded(RandomPicture(random, 30, 25));
     const struct {
@@ -85,7 +83,7 @@ TEST_P(FrameOperationsOnEachDevice, ARectangleIsCopiedOrRefusedWhole) {
 TEST_P(FrameOperationsOnEachDevice, ScaleMatchesTheReference) {
     Random random;
     for (int round = 0; round < 20; ++round) {
-        SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed() << ", round " << round);
+        SCOPED_TRACE(round);
         const Picture in = Rounded(RandomPicture(random, random.Int(1, 120), random.Int(1, 60)));
         const float scaleX = random.Uniform(0.1F, 2.5F), scaleY = random.Uniform(0.1F, 2.5F);
         Picture expected(std::max(1, static_cast<int>(static_cast<float>(in.width) * scaleX)),
@@ -106,7 +104,6 @@ TEST_P(FrameOperationsOnEachDevice, ScaleMatchesTheReference) {
 
 TEST_P(FrameOperationsOnEachDevice, CopyFrameChangesFormatAndSize) {
     Random random;
-    SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed());
     const Picture in = Rounded(RandomPicture(random, 43, 19));
     const auto source = UploadFrame(GetDevice(), GetFormat(), in);
     for (const DeviceCase& other : {AllDeviceCases()[0], AllDeviceCases()[1]}) {
@@ -132,12 +129,12 @@ TEST_P(FrameOperationsOnEachDevice, ConvertsEveryLayoutOfTheHost) {
         kPixelFormat_VUYA_4444_8u,     kPixelFormat_VUYX_4444_8u,     kPixelFormat_VUYP_4444_8u,
         kPixelFormat_VUYA_4444_8u_709, kPixelFormat_VUYX_4444_8u_709, kPixelFormat_VUYP_4444_8u_709,
         kPixelFormat_BGRA_4444_32f};
+    constexpr PixelAspectRatio kAspect{16, 15};
     Random random;
     for (const PixelFormat layout : kLayouts) {
         for (const std::uint32_t alphaType : {kAlphaType_Straight, kAlphaType_Premultiplied, kAlphaType_None}) {
-            SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed() << ", " << Vellum::ToText(layout)
-                                            << ", alpha type " << alphaType);
-            const auto host = Kiln::CreateHostVideoFrame(layout, 41, 13, kPixelAspectRatio_Square, 0, {});
+            SCOPED_TRACE(testing::Message() << Vellum::ToText(layout) << ", alpha type " << alphaType);
+            const auto host = Kiln::CreateHostVideoFrame(layout, 41, 13, kAspect, 0, {7, 8});
             ASSERT_TRUE(host);
             host->SetAlphaType(alphaType);
             auto* bytes = reinterpret_cast<unsigned char*>(Ostrand::Demand<Marl::IFrameData>(host)->GetData());
@@ -162,6 +159,10 @@ TEST_P(FrameOperationsOnEachDevice, ConvertsEveryLayoutOfTheHost) {
             ASSERT_EQ(Kiln::CopyToHostFrame(upload, host, RenderQuality::kHigh), Ostrand::kStatus_OK);
             const auto unconverted = Kiln::CopyToDevice(upload);
             ASSERT_TRUE(unconverted);
+            EXPECT_EQ(unconverted->GetPixelFormat(), layout);
+            EXPECT_EQ(unconverted->GetAlphaType(), alphaType);
+            EXPECT_EQ(unconverted->GetPixelAspectRatio(), kAspect);
+            EXPECT_EQ(unconverted->GetOrigin(), (Point{7, 8}));
             const auto target = UploadFrame(GetDevice(), GetFormat(), Picture(41, 13));
             ASSERT_EQ(Kiln::ConvertFrame(unconverted, target), Ostrand::kStatus_OK);
             const Picture expected = Host::Software::ReadPicture(bytes, rowBytes, 41, 13, layout, alphaType);
@@ -178,7 +179,6 @@ TEST_P(FrameOperationsOnEachDevice, ConvertsEveryLayoutOfTheHost) {
 
 TEST_P(FrameOperationsOnEachDevice, UnpremultiplyTakesTheMatteOut) {
     Random random;
-    SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed());
     Picture picture = Rounded(RandomPicture(random, 57, 23));
     picture.At(20, 10)[2] = NAN;
     picture.At(20, 10)[3] = 0.5F;
@@ -202,7 +202,6 @@ TEST_P(FrameOperationsOnEachDevice, UnpremultiplyTakesTheMatteOut) {
 
 TEST_P(FrameOperationsOnEachDevice, DeinterlaceKeepsTheKeptLinesToTheBit) {
     Random random;
-    SCOPED_TRACE(testing::Message() << "seed " << random.GetSeed());
     for (const int height : {1, 2, 7, 20}) {
         for (const int keep : {0, 1}) {
             const Picture picture = Rounded(RandomPicture(random, 45, height));

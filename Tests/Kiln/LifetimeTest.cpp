@@ -72,14 +72,5 @@ TEST_P(LifetimeOnEachFramework, ExclusiveAccessIsRecursiveAndHoldsOthersOff) {
     EXPECT_NE(worker, std::thread::id());
 }
 
-TEST(MatchNames, AreListedOnce) {
-    RegisterMatchName(u"TQ.First");
-    RegisterMatchName(u"TQ.Second");
-    RegisterMatchName(u"TQ.First");
-    const auto names = GetRegisteredMatchNames();
-    EXPECT_EQ(std::count(names.begin(), names.end(), u"TQ.First"), 1);
-    EXPECT_EQ(std::count(names.begin(), names.end(), u"TQ.Second"), 1);
-}
-
 }  // namespace
 }  // namespace Kiln

@@ -43,19 +43,6 @@ TEST_P(MemoryOnEachFramework, FiguresFollowEveryBlock) {
     }
 }
 
-TEST_P(MemoryOnEachFramework, AFreedBlockServesItsSizeAgain) {
-    const std::uint64_t first = Memory().Allocate(5 * kMega + 17);
-    const std::uint64_t other = Memory().Allocate(9 * kMega);
-    Memory().Free(first);
-    Memory().Free(other);
-    Memory().ResetStatistics();
-    EXPECT_EQ(Memory().Allocate(5 * kMega + 17), first);
-    EXPECT_EQ(Memory().GetStatistics().poolHits, 1U);
-    EXPECT_EQ(Memory().ReleaseUnused(kMega), 0U) << "the one pooled block is larger than what may go";
-    EXPECT_GE(Memory().ReleaseUnused(10 * kMega), 9 * kMega);
-    Memory().Free(first);
-}
-
 TEST_P(MemoryOnEachFramework, TheLimitIsTheDevicesUnlessLowered) {
     const std::uint64_t whole = mDevice->GetMemoryLimit();
     EXPECT_EQ(Memory().GetFigures().hardLimit, whole);

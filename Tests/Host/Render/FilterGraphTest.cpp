@@ -27,7 +27,6 @@ Picture RunGraph(const std::string& text, const Picture& picture, std::int64_t t
 
 TEST(FilterGraph, FloatFiltersKeepEveryBit) {
     Random random;
-    SCOPED_TRACE(random.GetSeed());
     const Picture picture = RandomPicture(random, 37, 23);
     // A filter that moves nothing, and one that moves pixels: values beyond 0 and 1 and alpha come through both.
     EXPECT_TRUE(PicturesAgree(RunGraph("null", picture), picture, kExactly));
@@ -84,25 +83,6 @@ TEST(FilterGraphs, ALayerOfAnotherSizeStaysCentred) {
     EXPECT_EQ(layer.picture.width, 30);
     EXPECT_EQ(layer.picture.height, 14);
     EXPECT_EQ(layer.origin, (Vellum::Point{7, 1}));
-}
-
-TEST(FilterGraphs, ServesManyThreadsAtOnce) {
-    FilterGraphs graphs;
-    Random random;
-    const Picture picture = RandomPicture(random, 33, 21);
-    Picture expected = RunGraph("gblur=sigma=1.5", picture);
-    std::vector<std::thread> threads;
-    for (int i = 0; i < 4; ++i) {
-        threads.emplace_back([&] {
-            for (int run = 0; run < 20; ++run) {
-                LayerPicture layer;
-                layer.picture = picture;
-                graphs.Run("gblur=sigma=1.5", run, layer);
-                EXPECT_TRUE(PicturesAgree(layer.picture, expected, kExactly));
-            }
-        });
-    }
-    for (std::thread& thread : threads) thread.join();
 }
 
 TEST(FilterGraph, ParametersFillInTheirNames) {

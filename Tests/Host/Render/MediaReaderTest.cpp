@@ -100,15 +100,6 @@ TEST_F(MediaReaderTest, ServesManyThreadsWithFewDecoders) {
     EXPECT_EQ(mReader->GetDecodedFrames(), 240);
 }
 
-TEST_F(MediaReaderTest, ManyFilesKeepWorkingWhenDecodersAreClosed) {
-    for (int i = 0; i < 20; ++i) {
-        WriteNumberFilm(mFolder / (std::to_string(i) + ".mp4"), 2, kTicks24, static_cast<std::uint32_t>(100 * i));
-    }
-    for (int round = 0; round < 2; ++round) {
-        for (int i = 0; i < 20; ++i) EXPECT_EQ(NumberAt(mFolder / (std::to_string(i) + ".mp4"), 1), 100 * i + 1);
-    }
-}
-
 TEST_F(MediaReaderTest, FailuresNameTheFileAndLeaveTheReaderUsable) {
     EXPECT_THAT([&] { (void)mReader->Read(mFolder / "none.mp4", 0); },
                 ThrowsMessage<MediaError>(testing::AllOf(HasSubstr("none.mp4"), HasSubstr("No such file"))));

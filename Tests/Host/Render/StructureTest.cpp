@@ -209,7 +209,12 @@ TEST(Structure, TitlesBarsAndSlatesAppearInTheirPlace) {
     Stage stage(
         Timeline({Track({Clip("bars", Range(0, 10), GeneratorOf("SMPTEBars"))}), Track({title})}, Format(320, 180)));
     const Picture picture = stage.Render(0);
-    ExpectPixel(picture, 10, 10, {0.75, 0.75, 0.75, 1});
+    for (int bar = 0; bar < 7; ++bar) {  // white, yellow, cyan, green, magenta, red, blue
+        const double red = bar % 4 < 2 ? 0.75 : 0, green = bar < 4 ? 0.75 : 0, blue = bar % 2 == 0 ? 0.75 : 0;
+        ExpectPixel(picture, 22 + 320 * bar / 7, 10, {red, green, blue, 1});
+        ExpectPixel(picture, 22 + 320 * (6 - bar) / 7, 127,
+                    {bar % 2 == 0 ? red : 0, bar % 2 == 0 ? green : 0, bar % 2 == 0 ? blue : 0, 1});
+    }
     int white = 0;
     for (int y = 60; y < 120; ++y) {
         for (int x = 80; x < 240; ++x) white += picture.At(x, y)[0] > 0.99F && picture.At(x, y)[1] > 0.99F ? 1 : 0;

@@ -69,30 +69,6 @@ TEST(Titles, StandAtTheirPlaceInTheirColour) {
     EXPECT_NEAR(right.top - box.top, 90, 1);
 }
 
-TEST(Titles, ScaleWithSizeLinesAndPixelAspect) {
-    Title title;
-    title.text = "Hgx\xC3\xA9";
-    const Box tenth = Find(Draw(title));
-    title.size = 36;
-    const Box same = Find(Draw(title));
-    EXPECT_EQ(tenth.left, same.left);
-    EXPECT_EQ(tenth.bottom, same.bottom);
-    title.size = 72;
-    const Box twice = Find(Draw(title));
-    EXPECT_NEAR(twice.right - twice.left, 2 * (same.right - same.left), 4);
-    EXPECT_NEAR(twice.coverage / same.coverage, 4.0, 0.1);
-
-    // Pixels twice as wide as high: half as many of them.
-    const Box wide = Find(Draw(title, 640, 360, 2.0));
-    EXPECT_NEAR(wide.right - wide.left, (twice.right - twice.left) / 2.0, 3);
-    EXPECT_EQ(wide.bottom - wide.top, twice.bottom - twice.top);
-
-    title.text = "H\nH";
-    const Box lines = Find(Draw(title));
-    EXPECT_NEAR((lines.top + lines.bottom) / 2.0, 180, 8);
-    EXPECT_NEAR(lines.bottom - lines.top, 72 * (1.15 + 0.69), 6);
-}
-
 TEST(Titles, FindTheirFonts) {
     const std::pair<const char*, const char*> fonts[] = {{"", "Sans-Regular"},
                                                          {"Arial Bold", "Sans-Bold"},
@@ -138,35 +114,6 @@ TEST(Slate, ShowsNameAndReasonOnDark) {
     Host::Software::DrawSlate("name", "reason", 1.0, tiny);
     Picture unnamed(64, 36);
     Host::Software::DrawSlate("", "", 1.0, unnamed);
-}
-
-TEST(ColorBars, HaveTheirLevels) {
-    Picture bars(720, 480);
-    Host::Software::DrawColorBars(bars);
-    KeepPicture(bars, "bars");
-    const auto expect = [&bars](int x, int y, double red, double green, double blue) {
-        EXPECT_NEAR(bars.At(x, y)[2], red, 1e-6) << x << "," << y;
-        EXPECT_NEAR(bars.At(x, y)[1], green, 1e-6) << x << "," << y;
-        EXPECT_NEAR(bars.At(x, y)[0], blue, 1e-6) << x << "," << y;
-        EXPECT_EQ(bars.At(x, y)[3], 1.0F);
-    };
-    const double level = 0.75;
-    const double colors[7][3] = {{level, level, level}, {level, level, 0}, {0, level, level}, {0, level, 0},
-                                 {level, 0, level},     {level, 0, 0},     {0, 0, level}};
-    for (int bar = 0; bar < 7; ++bar) {
-        const int middle = (2 * bar + 1) * 720 / 14;
-        expect(middle, 10, colors[bar][0], colors[bar][1], colors[bar][2]);
-        const double* reversed = colors[6 - bar];
-        if (bar % 2 == 0) {
-            expect(middle, 340, reversed[0], reversed[1], reversed[2]);
-        } else {
-            expect(middle, 340, 0, 0, 0);
-        }
-    }
-    expect(180, 470, 1, 1, 1);
-    expect(719, 479, 0, 0, 0);
-    EXPECT_LT(bars.At(530, 470)[1], 0.0F);
-    EXPECT_GT(bars.At(600, 470)[1], 0.0F);
 }
 
 }  // namespace

@@ -70,42 +70,6 @@ TEST(WorkerPool, CancelMarksWhatHasntBegun) {
     EXPECT_EQ(order, "+a-b");
 }
 
-TEST(WorkerPool, EveryJobRunsOnceThroughShutdown) {
-    std::atomic<int> ran{0};
-    std::atomic<int> cancelled{0};
-    {
-        WorkerPool pool(3);
-        for (int i = 0; i < 300; ++i) {
-            pool.Submit(i, [&](bool isCancelled) {
-                ++ran;
-                if (isCancelled) ++cancelled;
-                std::this_thread::sleep_for(std::chrono::microseconds(200));
-            });
-        }
-    }
-    EXPECT_EQ(ran, 300);
-    EXPECT_GT(cancelled, 0);
-}
-
-TEST(WorkerPool, JobsMaySubmitJobsAndDrainWaitsForThem) {
-    std::atomic<int> depth{0};
-    WorkerPool pool(2);
-    std::function<void(bool)> job = [&](bool) {
-        if (++depth < 50) pool.Submit(depth, job);
-    };
-    pool.Submit(0, job);
-    pool.Drain();
-    EXPECT_EQ(depth, 50);
-}
-
-TEST(WorkerPool, DrainMeansThatNothingIsHeld) {
-    const auto token = std::make_shared<int>(1);
-    WorkerPool pool(2);
-    for (int i = 0; i < 50; ++i) pool.Submit(i, [token](bool) {});
-    pool.Drain();
-    EXPECT_EQ(token.use_count(), 1);
-}
-
 TEST(PictureCache, DropsTheLeastRecentlyUsedByBytes) {
     const auto pool = Host::PixelBufferPool::Create();
     const auto picture = [&pool] { return Host::MakeHostPicture(*pool, Vellum::kPixelFormat_BGRA_4444_8u, 16, 10); };
