@@ -62,12 +62,6 @@ CUresult FindFunction(CUfunction* function, CUmodule, const char* name) {
     *function = reinterpret_cast<CUfunction>(gFrameworks->kernel);
     return CUDA_SUCCESS;
 }
-CUresult FindGlobal(CUdeviceptr* address, std::size_t* bytes, CUmodule, const char* name) {
-    gFrameworks->lookups.emplace_back(name);
-    *address = gFrameworks->kernel;
-    *bytes = 16;
-    return CUDA_SUCCESS;
-}
 cl_kernel CreateKernel(cl_program, const char* name, cl_int*) {
     gFrameworks->lookups.emplace_back(name);
     return reinterpret_cast<cl_kernel>(gFrameworks->kernel);
@@ -80,7 +74,6 @@ protected:
         GetCudaDriver().cuParamSetv = &NoteCudaArgument;
         GetCudaDriver().cuParamSetSize = &NoteSize;
         GetCudaDriver().cuModuleGetFunction = &FindFunction;
-        GetCudaDriver().cuModuleGetGlobal = &FindGlobal;
         GetOpenCL() = {&CreateKernel, &NoteOpenCLArgument, mOpenCL.clFinish};
     }
     void TearDown() override {
@@ -132,13 +125,6 @@ TEST_F(Kernels, ArgumentsAreAlignedToTheirOwnSizeOnCudaAndCountedOnOpenCL) {
 }
 
 void FlagAndValueKernel(Vellum::PixelFormat, DeviceValue, std::int32_t) {}
-
-TEST_F(Kernels, TheTotalCountsGapsAndIsNotRoundedUp) {
-    ASSERT_EQ(SetKernelArgs(DeviceFramework::kCuda, 5, FlagAndValueKernel, Kiln::kPixelFormat_GPU_BGRX_4444_16f, 3U, 4),
-              kStatus_OK);
-    EXPECT_EQ(frameworks.sizes, std::vector<unsigned>{20});
-    EXPECT_EQ(ValueAt<std::int32_t>(frameworks, 0), 0) << "16-bit float pixels";
-}
 
 TEST_F(Kernels, TheFirstFailureStopsThePackingAndIsMapped) {
     struct Row {
@@ -229,14 +215,6 @@ TEST_F(Kernels, EachDeviceOfEachFrameworkHasItsOwnSlot) {
     frameworks.kernel = 0;
     expected = 10;
     for (const auto& device : devices) EXPECT_EQ(GetKernel(table, device, kKey, "SomeKernel"), expected++);
-}
-
-TEST_F(Kernels, SymbolsExistOnCudaOnly) {
-    frameworks.kernel = 4096;
-    SymbolTable table;
-    EXPECT_EQ(GetSymbol(table, boost::make_shared<FakeDevice>(DeviceFramework::kCuda, 0), kKey, "inParams"), 4096U);
-    EXPECT_EQ(GetSymbol(table, boost::make_shared<FakeDevice>(DeviceFramework::kOpenCL, 0), kKey, "inParams"), 0U);
-    EXPECT_EQ(frameworks.lookups, std::vector<std::string>{"inParams"});
 }
 
 TEST(PixelPitch, FollowsTheFormatsLayoutAndElementWidth) {

@@ -112,14 +112,6 @@ TEST_F(FusionTest, RandomChainsGiveTheSameBytesFusedAndAlone) {
     EXPECT_GT(ReadCounters().fused, 100U);
 }
 
-TEST_F(FusionTest, ThreadCountsDontChangeResults) {
-    const auto several = RunChain(true, 640, 200, 1, 77);
-    Api().SoftCudaSetThreads(1);
-    const auto one = RunChain(true, 640, 200, 1, 77);
-    Api().SoftCudaSetThreads(8);
-    EXPECT_EQ(several, one);
-}
-
 TEST_F(FusionTest, AChainInPlaceTakesOnePassAndAnythingElseEndsIt) {
     DeviceFrame frame(64, 64, 64, 1);
     frame.Write(std::vector<Pixel>(64 * 64, Pixel{{1.0F, 1.0F, 1.0F, 1.0F}}));

@@ -3,9 +3,6 @@
 
 // Device memory: its size, its refusal, its copies and fills.
 
-#include <array>
-#include <numeric>
-
 #include "Tests/SoftCuda/DriverFixture.h"
 
 namespace SoftCudaTest {
@@ -64,20 +61,6 @@ TEST_F(MemoryTest, FailuresComeAsOftenAsAskedFor) {
     Api().SoftCudaSetFailEvery(0);
     constexpr CUresult kNo = CUDA_ERROR_OUT_OF_MEMORY, kYes = CUDA_SUCCESS;
     EXPECT_EQ(results, (std::vector<CUresult>{kYes, kYes, kNo, kYes, kYes, kNo, kYes}));
-}
-
-TEST_F(MemoryTest, AddressesLeadToTheirBlock) {
-    CUdeviceptr block = 0, base = 0;
-    std::size_t pitch = 0, bytes = 0;
-    CHECK_CUDA(cuMemAllocPitch_v2(&block, &pitch, 1000, 30, 16));
-    EXPECT_GE(pitch, 1000U);
-    EXPECT_EQ(pitch % 16, 0U);
-    CHECK_CUDA(cuMemGetAddressRange_v2(&base, &bytes, block + 5000));
-    EXPECT_EQ(base, block);
-    EXPECT_EQ(bytes, pitch * 30);
-    EXPECT_EQ(Api().cuMemGetAddressRange_v2(&base, &bytes, block + pitch * 30), CUDA_ERROR_NOT_FOUND);
-    EXPECT_EQ(Api().cuMemcpyHtoD_v2(block + pitch * 30 - 4, &bytes, 8), CUDA_ERROR_INVALID_VALUE);
-    CHECK_CUDA(cuMemFree_v2(block));
 }
 
 TEST_F(MemoryTest, FillsWriteTheirPattern) {

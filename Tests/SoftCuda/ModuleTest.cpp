@@ -3,54 +3,11 @@
 
 // The driver's names, its devices, its modules and how arguments reach kernels.
 
-#include <thread>
-
 #include "Tests/SoftCuda/DriverFixture.h"
 
 namespace SoftCudaTest {
 
 using ModuleTest = DriverTest;
-
-TEST(DriverDevices, ThereAreAsManyAsAskedForEachWithItsContexts) {
-    const ScopedVariable devices("SOFTCUDA_DEVICES", "3");
-    CHECK_CUDA(cuInit(0));
-    int count = 0, version = 0, major = 0;
-    CHECK_CUDA(cuDeviceGetCount(&count));
-    EXPECT_EQ(count, 3);
-    CHECK_CUDA(cuDriverGetVersion(&version));
-    EXPECT_GE(version, 4000);
-    CHECK_CUDA(cuDeviceGetAttribute(&major, CU_DEVICE_ATTRIBUTE_COMPUTE_CAPABILITY_MAJOR, 2));
-    EXPECT_EQ(major, 7);
-    CUdevice device = -1;
-    EXPECT_EQ(Api().cuDeviceGet(&device, 3), CUDA_ERROR_INVALID_DEVICE);
-    char name[64] = "";
-    CHECK_CUDA(cuDeviceGetName(name, sizeof name, 2));
-    EXPECT_NE(std::string(name).find('2'), std::string::npos);
-
-    CUcontext first = nullptr, second = nullptr, current = nullptr;
-    std::size_t unused = 0;
-    EXPECT_EQ(Api().cuMemGetInfo_v2(&unused, &unused), CUDA_ERROR_INVALID_CONTEXT);
-    CHECK_CUDA(cuCtxCreate_v2(&first, 0, 0));
-    CHECK_CUDA(cuCtxCreate_v2(&second, 0, 2));
-    CHECK_CUDA(cuCtxPopCurrent_v2(&current));
-    EXPECT_EQ(current, second);
-    CHECK_CUDA(cuCtxGetCurrent(&current));
-    EXPECT_EQ(current, first);
-    // Memory counts by device, and a context isn't another thread's until that thread takes it.
-    CUdeviceptr block = 0;
-    std::size_t freeFirst = 0, freeSecond = 0, total = 0;
-    CHECK_CUDA(cuMemAlloc_v2(&block, 1 << 20));
-    CHECK_CUDA(cuMemGetInfo_v2(&freeFirst, &total));
-    std::thread([&] {
-        EXPECT_EQ(Api().cuCtxSynchronize(), CUDA_ERROR_INVALID_CONTEXT);
-        CHECK_CUDA(cuCtxSetCurrent(second));
-        CHECK_CUDA(cuMemGetInfo_v2(&freeSecond, &total));
-    }).join();
-    EXPECT_EQ(freeFirst + (1 << 20), freeSecond);
-    CHECK_CUDA(cuCtxDestroy_v2(first));
-    EXPECT_EQ(Api().cuCtxPushCurrent_v2(first), CUDA_ERROR_INVALID_CONTEXT);
-    CHECK_CUDA(cuCtxDestroy_v2(second));
-}
 
 TEST_F(ModuleTest, ArgumentsLieAtMultiplesOfTheirOwnSize) {
     CUdeviceptr out = 0, in = 0;
@@ -143,19 +100,6 @@ TEST_F(ModuleTest, GlobalsBelongToTheirModuleAndChangeInOrder) {
     EXPECT_EQ(pixel.value[2], 48.0F);
     EXPECT_EQ(pixel.value[3], 12.0F);
     CHECK_CUDA(cuModuleUnload(other));
-}
-
-TEST_F(ModuleTest, WhatIsNoImageForThisDeviceIsToldApart) {
-    CUmodule module = nullptr;
-    alignas(8) unsigned char image[128] = {};
-    EXPECT_EQ(Api().cuModuleLoadData(&module, image), CUDA_ERROR_INVALID_IMAGE);
-    const unsigned magic = 0xBA55ED50;
-    std::memcpy(image, &magic, sizeof magic);
-    EXPECT_EQ(Api().cuModuleLoadData(&module, image), CUDA_ERROR_NO_BINARY_FOR_GPU);
-    EXPECT_EQ(Api().cuModuleLoadData(&module, nullptr), CUDA_ERROR_INVALID_VALUE);
-    CUfunction function = nullptr;
-    EXPECT_EQ(Api().cuModuleGetFunction(&function, mModule, "NoSuchKernel"), CUDA_ERROR_NOT_FOUND);
-    EXPECT_EQ(Api().cuModuleGetFunction(&function, nullptr, "GainKernel"), CUDA_ERROR_INVALID_HANDLE);
 }
 
 }  // namespace SoftCudaTest
