@@ -2,10 +2,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <gtest/gtest.h>
 
-#include <thread>
-#include <utility>
-#include <vector>
-
 #include "Ostrand/QueryTable.h"
 
 using namespace Ostrand;
@@ -71,27 +67,6 @@ TEST(CountedObjects, AnswerForEachInterfaceWithItsOwnPointer) {
         first.Reset();
         EXPECT_EQ(Allocator::GetLiveBlocks(), blocks + 1) << "the second interface still holds the object";
     }
-    EXPECT_EQ(Allocator::GetLiveBlocks(), blocks);
-}
-
-TEST(CountedObjects, AreCountedRightThroughCopiesMovesAndThreads) {
-    const std::int64_t blocks = Allocator::GetLiveBlocks();
-    InterfaceRef<Both> object = MakeRef<Both>(1);
-    std::vector<std::thread> threads;
-    for (int i = 0; i < 4; ++i) {
-        threads.emplace_back([shared = InterfaceRef<IFirst>(object)] {
-            for (int k = 0; k < 1000; ++k) {
-                InterfaceRef<IFirst> copy = shared;
-                InterfaceRef<IFirst> moved = std::move(copy);
-                copy = moved;
-                copy = *&copy;
-                EXPECT_TRUE(Query<ISecond>(moved));
-            }
-        });
-    }
-    object = nullptr;
-    for (std::thread& thread : threads) thread.join();
-    threads.clear();
     EXPECT_EQ(Allocator::GetLiveBlocks(), blocks);
 }
 

@@ -4,13 +4,10 @@
 
 #include <gtest/gtest.h>
 
-#include <algorithm>
 #include <chrono>
 #include <cstdio>
 #include <cstdlib>
-#include <filesystem>
 #include <future>
-#include <iterator>
 #include <memory>
 #include <stdexcept>
 #include <thread>
@@ -33,10 +30,6 @@ private:
 };
 
 ExecutorRef ThreadKind() { return Halden::threads::CreateThreadExecutor("executor under test"); }
-
-std::ptrdiff_t ThreadsOfThisProcess() {
-    return std::distance(std::filesystem::directory_iterator("/proc/self/task"), {});
-}
 
 class EveryExecutor : public testing::TestWithParam<ExecutorRef (*)()> {};
 
@@ -77,24 +70,6 @@ TEST_P(EveryExecutor, RunsWhatWasPostedAfterItsLastReferenceIsGone) {
     EXPECT_EQ(answer.get(), 10);
 }
 
-TEST_P(EveryExecutor, MayLoseItsLastReferenceToItsOwnWork) {
-    Door door;
-    auto released = std::make_shared<std::promise<void>>();
-    const std::future<void> end = released->get_future();
-    {
-        ExecutorRef executor = GetParam()();
-        const std::shared_ptr<void> atEnd(nullptr, [released](void*) { released->set_value(); });
-        executor->Post(
-            [executor, atEnd, &door]() mutable {
-                door.Wait();
-                executor.reset();
-            },
-            0);
-    }
-    door.Open();
-    EXPECT_EQ(end.wait_for(std::chrono::seconds(60)), std::future_status::ready);
-}
-
 TEST_P(EveryExecutor, LeavesNoWorkBehindWhenTheProcessEnds) {
     testing::FLAGS_gtest_death_test_style = "threadsafe";
     const auto endWithWorkPosted = [] {
@@ -119,25 +94,3 @@ TEST_P(EveryExecutor, EndsTheProcessWhenWorkThrows) {
 
 INSTANTIATE_TEST_SUITE_P(, EveryExecutor, testing::Values(&ThreadKind, &Halden::threads::CreateCPUBoundExecutor),
                          [](const auto& kind) { return kind.index == 0 ? "OwnThread" : "SharedPool"; });
-
-TEST(SharedPool, RunsManyExecutorsAtOnceEachInItsOrder) {
-    const std::ptrdiff_t threadsBefore = ThreadsOfThisProcess();
-    const ExecutorRef waiting = Halden::threads::CreateCPUBoundExecutor();
-    Door door;
-    waiting->Post([&door] { door.Wait(); }, 0);
-
-    std::vector<ExecutorRef> executors;
-    std::vector<int> lengths(100, 0);
-    for (std::size_t i = 0; i < lengths.size(); ++i) executors.push_back(Halden::threads::CreateCPUBoundExecutor());
-    for (int round = 0; round < 20; ++round) {
-        for (std::size_t i = 0; i < lengths.size(); ++i) {
-            executors[i]->Post([&length = lengths[i], round] { length = length == round ? round + 1 : -1000; }, 0);
-        }
-    }
-    EXPECT_LE(ThreadsOfThisProcess() - threadsBefore, std::max(2U, std::thread::hardware_concurrency()));
-    // The waiting executor occupies one thread of the pool all the while.
-    for (const ExecutorRef& executor : executors) executor->Drain();
-    for (const int length : lengths) EXPECT_EQ(length, 20);
-    door.Open();
-    waiting->Drain();
-}

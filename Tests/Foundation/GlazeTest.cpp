@@ -24,12 +24,6 @@ Glaze MakeGlaze(Storage& storage) {
     glaze.pixelFormat = Vellum::FourCC("bgrp");
     glaze.width = 8;
     glaze.height = 6;
-    glaze.aspectNumerator = 4;
-    glaze.aspectDenominator = 3;
-    glaze.fieldType = Vellum::kFieldType_LowerFirst;
-    glaze.alphaType = Vellum::kAlphaType_Premultiplied;
-    glaze.originX = -3;
-    glaze.originY = 5;
     glaze.rowBytes = sizeof storage.pixels[0];
     glaze.pixels = storage.pixels;
     glaze.storage = &storage;
@@ -39,30 +33,6 @@ Glaze MakeGlaze(Storage& storage) {
 }
 
 }  // namespace
-
-TEST(GlazeFrames, CarryTheRecordsAttributesAndReachItsPixels) {
-    Storage storage;
-    const Marl::VideoFrameRef frame = [&storage] {
-        const Glaze glaze = MakeGlaze(storage);  // gone when the frame is used
-        return Tarn::GetVideoFrameFromGlaze(&glaze);
-    }();
-    ASSERT_TRUE(frame);
-    EXPECT_EQ(frame->GetBounds(), (Vellum::Rect{0, 0, 8, 6}));
-    EXPECT_EQ(frame->GetOrigin(), (Vellum::Point{-3, 5}));
-    EXPECT_EQ(frame->GetPixelFormat(), Vellum::kPixelFormat_BGRP_4444_8u);
-    EXPECT_EQ(frame->GetPixelAspectRatio(), (Vellum::PixelAspectRatio{4, 3}));
-    EXPECT_EQ(frame->GetFieldType(), Vellum::kFieldType_LowerFirst);
-    EXPECT_EQ(frame->GetAlphaType(), Vellum::kAlphaType_Premultiplied);
-    EXPECT_EQ(Ostrand::Demand<Marl::IFrameData>(frame)->GetData(), reinterpret_cast<std::uintptr_t>(storage.pixels));
-    EXPECT_EQ(Ostrand::Demand<Marl::IFrameRows>(frame)->GetRowBytes(), 40);
-    EXPECT_EQ(Ostrand::Query<Marl::IVideoFrame>(Ostrand::Query<Marl::IFrameRows>(frame)), frame);
-    EXPECT_FALSE(Ostrand::Query<Marl::IFrameIdentity>(frame)) << "only device frames carry a fingerprint";
-
-    frame->SetOrigin({1, 2});
-    frame->SetFieldType(Vellum::kFieldType_Progressive);
-    EXPECT_EQ(frame->GetOrigin(), (Vellum::Point{1, 2}));
-    EXPECT_EQ(frame->GetFieldType(), Vellum::kFieldType_Progressive);
-}
 
 TEST(GlazeFrames, HoldTheStorageUntilTheLastInterfaceGoes) {
     Storage storage;

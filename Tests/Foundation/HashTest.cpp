@@ -2,7 +2,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <gtest/gtest.h>
 
-#include <cstring>
 #include <set>
 #include <vector>
 

@@ -2,7 +2,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include <gtest/gtest.h>
 
-#include <cstring>
 #include <string>
 
 #include "Brae/Conversions.h"
@@ -109,15 +108,4 @@ TEST(Base64, RefusesWhatIsMalformedAndEmptiesTheOutput) {
         EXPECT_EQ(Marl::DecodeBinaryDataFromUTF8String(text, decoded), Ostrand::kStatus_Failure) << text;
         EXPECT_TRUE(decoded.empty()) << text;
     }
-}
-
-TEST(HostConversions, KeepWhatIsKnownAndReplaceTheRest) {
-    for (std::uint32_t known = 0; known <= 4; ++known) EXPECT_EQ(Brae::SDKToBEFieldType(known), known);
-    EXPECT_EQ(Brae::SDKToBEFieldType(5), Vellum::kFieldType_Unknown);
-    for (std::int32_t known = 0; known <= 2; ++known) EXPECT_EQ(Brae::SDKToBEAlphaType(known), known);
-    EXPECT_EQ(Brae::SDKToBEAlphaType(3), Vellum::kAlphaType_Straight);
-    EXPECT_EQ(Brae::SDKToBEAlphaType(-1), Vellum::kAlphaType_Straight);
-    for (std::int32_t known = 0; known <= 10; ++known) EXPECT_EQ(Brae::SDKToVellumPulldownCadence(known), known);
-    EXPECT_EQ(Brae::SDKToVellumPulldownCadence(11), 0U);
-    EXPECT_EQ(Brae::SDKToVellumPulldownCadence(-1), 0U);
 }

@@ -30,17 +30,6 @@ private:
 
 }  // namespace
 
-TEST(Tracing, IsGatedByCategoryAndLevel) {
-    EXPECT_FALSE(debug::TraceEnabled("Test.Levels", 0, 1));
-    debug::SetTraceLevel("Test.Levels", 10);
-    EXPECT_TRUE(debug::TraceEnabled("Test.Levels", 0, 1));
-    EXPECT_TRUE(debug::TraceEnabled("Test.Levels", 10, 1));
-    EXPECT_FALSE(debug::TraceEnabled("Test.Levels", 11, 1));
-    EXPECT_FALSE(debug::TraceEnabled("Test.Level", 10, 1));
-    debug::SetTraceLevel("Test.Levels", -1);
-    EXPECT_FALSE(debug::TraceEnabled("Test.Levels", 0, 1));
-}
-
 TEST(Tracing, WritesWholeLinesFromManyThreads) {
     const CollectedLines lines;
     const debug::TraceGate gate("Test.Lines", 10);

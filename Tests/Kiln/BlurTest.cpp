@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include <cmath>
 
 #include "Host/Software/Effects/GaussianBlur.h"
 #include "Kiln/FrameOperations.h"

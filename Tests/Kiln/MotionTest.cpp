@@ -153,34 +153,6 @@ TEST_P(MotionOnEachDevice, RightAnglesAndFlipsKeepEveryBit) {
     }
 }
 
-TEST_P(MotionOnEachDevice, TransparentPixelsNeverBleedAndAlphaStaysCoverage) {
-    Random random;
-    Picture layer(48, 48);
-    for (int y = 0; y < 48; ++y) {
-        for (int x = 0; x < 48; ++x) {
-            // Green that nobody may see, and blocks of grey.
-            const bool seen = ((x / 6 + y / 6) & 1) != 0;
-            layer.Set(x, y, seen ? Pixel{0.5, 0.5, 0.5, 1.0} : Pixel{0.0, 100.0, 0.0, 0.0});
-        }
-    }
-    for (const RenderQuality quality : {RenderQuality::kMedium, RenderQuality::kMaximum}) {
-        LayerDrawing drawing;
-        drawing.quality = quality;
-        drawing.rotation = random.Uniform(5.0F, 40.0F);
-        drawing.scaleX = drawing.scaleY = random.Uniform(0.4F, 2.0F);
-        const Picture out = Draw(layer, Picture(96, 96), drawing);
-        for (int y = 0; y < 96; ++y) {
-            for (int x = 0; x < 96; ++x) {
-                const Pixel pixel = out.Get(x, y);
-                ASSERT_GE(pixel[3], 0.0);
-                ASSERT_LE(pixel[3], 1.0);
-                for (std::size_t c = 0; c < 3 && pixel[3] > 0.0; ++c)
-                    ASSERT_NEAR(pixel[c], 0.5, IsHalf() ? 2e-3 : 1e-3);
-            }
-        }
-    }
-}
-
 TEST_P(MotionOnEachDevice, BlendModesMatchTheReference) {
     Random random;
     for (std::int32_t mode = -1; mode <= Kiln::kBlend_Count; ++mode) {
