@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
 #include <cstdlib>

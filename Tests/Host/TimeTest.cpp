@@ -72,22 +72,5 @@ TEST(ExactTime, AFrameBeginsAMicrosecondEarly) {
     EXPECT_EQ(FrameNumberAt(-kFrameTolerance - 1, kFrame), -1);
 }
 
-TEST(TimeMaps, TheAnswerForAnItemLeadsBackToItsTime) {
-    for (const double speed : {1.0, 2.0, 0.5, 0.8545454551724138, -1.0, -0.73}) {
-        TimeMap map;
-        map.motion = speed < 0 ? Motion::kBackward : Motion::kForward;
-        map.speed = speed;
-        map.in = 40 * kFrame;
-        map.duration = 60 * kFrame;
-        map.frameTicks = kFrame;
-        for (std::int64_t t = -5; t < 65; ++t) {
-            const ItemTimes direct = map.AtItemTime(t * kFrame);
-            const ItemTimes recovered = map.FromTransformed(map.Transform(t * kFrame));
-            EXPECT_NEAR(static_cast<double>(recovered.item), static_cast<double>(direct.item), 2) << speed;
-            EXPECT_NEAR(static_cast<double>(recovered.media), static_cast<double>(direct.media), 2) << speed;
-        }
-    }
-}
-
 }  // namespace
 }  // namespace Vantrel::Host::Test

@@ -126,6 +126,10 @@ testing::AssertionResult PicturesAgree(const Picture& actual, const Picture& exp
     const auto pixels = static_cast<double>(actual.width) * actual.height;
     const double excepted = tolerance.exceptionShare > 0.0 ? std::max(1.0, tolerance.exceptionShare * pixels) : 0.0;
     if (static_cast<double>(different) <= excepted) return testing::AssertionSuccess();
+    if (const char* folder = std::getenv("VANTREL_TEST_PICTURES")) {
+        WritePng(actual, std::string(folder) + "/actual.png");
+        WritePng(expected, std::string(folder) + "/expected.png");
+    }
     return testing::AssertionFailure() << different << " of " << pixels << " pixels differ; worst at (" << worst.x
                                        << ", " << worst.y << "), channel "
                                        << "BGRA"[worst.channel] << ", by " << worst.excess << " more than allowed: got "

@@ -75,7 +75,8 @@ struct Tolerance {
 /// Equal to the bit, but that one NaN is as good as another and 0 equals -0.
 constexpr Tolerance kExactly{};
 
-/// Passes when the pictures agree, else tells the worst pixel, both values and how many differ.
+/// Passes when the pictures agree, else tells the worst pixel, both values and how many differ, and leaves both as PNG
+/// in the folder that VANTREL_TEST_PICTURES names.
 [[nodiscard]] testing::AssertionResult PicturesAgree(const Picture& actual, const Picture& expected,
                                                      const Tolerance& tolerance);
 

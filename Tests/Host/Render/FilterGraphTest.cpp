@@ -3,9 +3,6 @@
 #include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <cmath>
-#include <thread>
-
 #include "Host/Software/EffectRunner.h"
 #include "Host/Software/FilterGraph.h"
 #include "Tests/Support/Pictures.h"

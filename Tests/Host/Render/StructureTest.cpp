@@ -24,28 +24,10 @@ void ExpectColor(const Picture& picture, const Color& color) { ExpectPixel(pictu
 Color Mix(const Color& a, const Color& b, double share) {
     return {a[0] + (b[0] - a[0]) * share, a[1] + (b[1] - a[1]) * share, a[2] + (b[2] - a[2]) * share, a[3]};
 }
-Color Product(const Color& a, const Color& b) { return {a[0] * b[0], a[1] * b[1], a[2] * b[2], a[3]}; }
 
 /// Of the solids that most tests show, (255, 85, 0) and (0, 170, 255).
 const Color kOrange{1, kThird, 0, 1};
 const Color kAzure{0, kTwoThirds, 1, 1};
-
-TEST(Structure, OpacityAndBlendModesMeetWhatLiesBelow) {
-    const Color below{kTwoThirds, kThird, 0, 1};
-    const Color above{kThird, kTwoThirds, 1, 1};
-    const Json rising = {{"keyframes", {{{"t", Time(0)}, {"value", 0}}, {{"t", Time(8)}, {"value", 100}}}}};
-    const std::pair<Json, Color> cases[] = {
-        {Opacity(50), Mix(below, above, 0.5)},
-        {Opacity(100, 17), Product(below, above)},
-        {Opacity(50, 17), Mix(below, Product(below, above), 0.5)},
-        {Effect("TQ.XQVE Opacity", {{"0", rising}}), Mix(below, above, 0.25)},
-    };
-    for (const auto& [effect, color] : cases) {
-        const Json top = Solid(85, 170, 255, 10, Effects({effect}));
-        Stage stage(Timeline({Track({Solid(170, 85, 0, 10)}), Track({top})}, Format(8, 4)));
-        ExpectColor(stage.Render(2), color);
-    }
-}
 
 TEST(Structure, TheBottomLayerHasNoBlendModeAndWithOneNoOpacity) {
     for (const auto& [effect, alpha] : {std::pair{Opacity(40, 17), 1.0}, {Opacity(40), 0.4}, {Opacity(99.9995), 1.0}}) {

@@ -1,9 +1,7 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include <gmock/gmock.h>
 #include <gtest/gtest.h>
 
-#include <atomic>
 #include <future>
 #include <string>
 
