@@ -18,10 +18,7 @@ protected:
     [[nodiscard]] RenderNodeRef MakeNode(const Overrides& values) {
         const VideoNodeRef description = DescribeEffect(kBasic3DEffect.matchName, MakeParams(kBasic3DEffect, values));
         RenderNodeRef node(new Basic3DNode);
-        RenderRequirements requirements;
-        requirements.device = GetDevice();
-        bool needsHost = false;
-        EXPECT_EQ(node->Configure(description, requirements, needsHost), Ostrand::kStatus_OK);
+        EXPECT_TRUE(Configure(node, description));
         return node;
     }
     [[nodiscard]] Picture Render(const Overrides& values, const Picture& picture) {

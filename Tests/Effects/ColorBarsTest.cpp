@@ -15,10 +15,7 @@ using ColorBarsOnEachDevice = EffectTest;
 TEST_P(ColorBarsOnEachDevice, AreThePatternAtEverySizeAndOneFrameForAllTimes) {
     Random random;
     const Ostrand::InterfaceRef<ColorBarsNode> bars(new ColorBarsNode);
-    RenderRequirements requirements;
-    requirements.device = GetDevice();
-    bool needsHost = false;
-    bars->Configure({}, requirements, needsHost);
+    EXPECT_TRUE(Configure(RenderNodeRef(bars), {}));
     RenderParams request;
     request.quality = IsHalf() ? 1 : 2;
     const bool isCuda = GetParam().framework == Kiln::DeviceFramework::kCuda;

@@ -67,6 +67,17 @@ protected:
     /// The node of a key of the registry, or the host's where that one refuses.
     [[nodiscard]] RenderNodeRef MakeNode(const std::string& key, const VideoNodeRef& description,
                                          Vellum::Rect frameRect = {0, 0, 64, 36});
+    /// Configures a node for the device; false where it refuses.
+    bool Configure(const RenderNodeRef& node, const VideoNodeRef& description,
+                   Vellum::Rect frameRect = {0, 0, 64, 36}) {
+        bool needsHost = false;
+        RenderRequirements requirements;
+        requirements.frameRect = frameRect;
+        requirements.pixelAspectRatio = Vellum::kPixelAspectRatio_Square;
+        requirements.device = GetDevice();
+        return !Ostrand::Failed(node->Configure(description, requirements, needsHost));
+    }
+
     /// Renders `node` over a frame at a clip time. Failures fail the test.
     VideoFrameRef RenderOver(const RenderNodeRef& node, const VideoFrameRef& input, std::int64_t clipTime = 0);
     Status TryRenderOver(const RenderNodeRef& node, const VideoFrameRef& input, VideoFrameRef& output,

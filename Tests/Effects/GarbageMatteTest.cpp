@@ -2,8 +2,6 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "Host/Software/Effects/GarbageMatte.h"
 
-#include <cmath>
-
 #include "Tests/Effects/EffectTester.h"
 
 namespace Vantrel::Testing {

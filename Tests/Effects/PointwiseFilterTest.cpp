@@ -3,7 +3,6 @@
 #include "Src/Filters/Effects/PointwiseFilterHostNode.h"
 
 #include <cmath>
-#include <sstream>
 
 #include <boost/make_shared.hpp>
 
@@ -37,12 +36,7 @@ protected:
         std::vector<std::uint32_t>& operators = host.nodes[kClip].operators;
         if (operators.size() <= place) operators.resize(place + 1, id);
         const VideoSegmentsHandle handle(kSequence, SegmentsMode::kPlain, "");
-        RenderRequirements requirements;
-        requirements.frameRect = {0, 0, 64, 36};
-        requirements.device = GetDevice();
-        bool needsHost = false;
-        return createNode(Halden::ToWide(link.matchName), GetDevice(), GetEffect(AcquireRootNode(handle, 0), place),
-                          requirements, needsHost);
+        return MakeNode(link.matchName, GetEffect(AcquireRootNode(handle, 0), place));
     }
 
     /// The links over a frame, the first one lowest. @return from the lowest to the top
@@ -108,10 +102,8 @@ TEST_P(PointwiseFilters, RecordsHoldEachParameterAtItsPlace) {
         PointwiseFilterRecord record{};
         bool needsNewFrame = false;
         FillPointwiseFilterRecord(*node, params, record, needsNewFrame);
-        std::ostringstream text;
-        for (int i = 0; i < 11; ++i) text << (&record.r1)[i] << " for " << (&expected.r1)[i] << "; ";
         EXPECT_EQ(std::memcmp(&record, &expected, sizeof record), 0)
-            << link.matchName << ", type " << record.type << ": " << text.str();
+            << link.matchName << ": " << testing::PrintToString(std::vector<float>(&record.r1, &record.r1 + 11));
         EXPECT_EQ(needsNewFrame, record.type == 12 || record.type == 16);
     };
     for (const int set : {1, 2, 3}) {

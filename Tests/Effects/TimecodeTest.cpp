@@ -1,6 +1,5 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include <cmath>
 
 #include "Tarn/Text.h"
 #include "Tests/Effects/EffectTester.h"
@@ -75,19 +74,6 @@ TEST_P(TimecodeOnEachDevice, AgreesWithTheScalarVersionOnPicturesOfEverySize) {
         ASSERT_EQ(drawn.width, layer.picture.width);
         EXPECT_TRUE(PicturesAgree(drawn, RoundTo(layer.picture, GetFormat()), GetTolerance()));
     }
-}
-
-TEST_P(TimecodeOnEachDevice, ASmallPictureStaysSoUnlessTheTextLeavesIt) {
-    const VideoFrameRef input = MakePaddedFrame(GetDevice(), GetFormat(), Plain(120, 30, {0.5, 0.5, 0.5, 1}), 2);
-    VideoFrameRef output;
-    ASSERT_EQ(TryRender(MakeTimecode({}, 0.5, 0.5), input, Request(input, 200, 101), output), Ostrand::kStatus_OK);
-    EXPECT_EQ(output, input);
-    ASSERT_EQ(TryRender(MakeTimecode({}, 0.5, 0.9), input, Request(input, 200, 101), output), Ostrand::kStatus_OK);
-    EXPECT_EQ(output->GetBounds(), (Vellum::Rect{0, 0, 200, 101}));
-    const Picture framed = DownloadFrame(GetDevice(), output);
-    EXPECT_EQ(framed.At(40, 36)[3], 1.0F) << "the picture stands in the middle";
-    EXPECT_EQ(framed.At(39, 36)[3], 0.0F);
-    EXPECT_EQ(framed.At(40, 35)[3], 0.0F);
 }
 
 INSTANTIATE_TEST_SUITE_P(Devices, TimecodeOnEachDevice, ::testing::ValuesIn(AllDeviceCases()), NameOfCase);

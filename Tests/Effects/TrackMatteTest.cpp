@@ -167,13 +167,6 @@ TEST_P(TrackMatteOnEachDevice, TheMatteMovesThoughACompositorHasDrawnItBefore) {
     stack->EndFrame({}, MakeRequest(input), results, 0);
 }
 
-TEST_P(TrackMatteOnEachDevice, ATrackIsNotItsOwnMatte) {
-    const RenderNodeRef effect = MakeMatte(1, false, false);
-    host.nodes[kClip].properties["ClipNode::TrackID"] = "1";
-    const Picture in = Plain(4, 4, {0.5, 0.5, 0.5, 0.5});
-    EXPECT_TRUE(PicturesAgree(Apply(effect, in, effect, 4, 4), in, kExactly)) << "it has none";
-}
-
 INSTANTIATE_TEST_SUITE_P(Devices, TrackMatteOnEachDevice, ::testing::ValuesIn(AllDeviceCases()), NameOfCase);
 
 }  // namespace

@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
 // Values worked out by hand: what device tests are held against must itself stand on something.
-#include <cstring>
 
 #include "Host/Software/Effects/BlendModes.h"
 #include "Host/Software/Effects/Convert.h"
