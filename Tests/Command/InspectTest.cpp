@@ -117,22 +117,6 @@ TEST_F(Inspect, TextShowsABarAndColoursOnlyATerminal) {
     EXPECT_THAT(onTerminal("NO_COLOR=1"), AllOf(HasSubstr("DDDD"), Not(HasSubstr("\033["))));
 }
 
-TEST_F(Inspect, SaysWhatIsWrong) {
-    const std::string file = WriteMixed();
-    const std::tuple<std::string, int, const char*> cases[] = {
-        {Path("nowhere.otio"), 1, "nowhere.otio"},
-        {file + " --size 3by4 --html " + Path("page.html"), 1, "3by4"},
-        {file + " --device abacus", 1, "abacus"},
-        {file + " --html " + Path("no/such/page.html"), 3, "no/such"},
-    };
-    for (const auto& [arguments, status, word] : cases) {
-        const Outcome outcome = Run("inspect " + arguments);
-        EXPECT_EQ(outcome.status, status) << arguments;
-        EXPECT_THAT(outcome.err, HasSubstr(word));
-    }
-    EXPECT_FALSE(std::filesystem::exists(Path("page.html")));
-}
-
 /// Clicks and presses in the page, and leaves of it what it showed each time.
 constexpr const char* kVisit = R"(<script>addEventListener('load', async () => {
     const detail = () => document.getElementById('detail').textContent;

@@ -85,23 +85,6 @@ TEST_P(AdjustmentDevice, OnlyTheMatteMovesWithTheLayer) {
     expectSwitchAt(64);
 }
 
-TEST_P(AdjustmentDevice, RefusedMemoryIsTriedAgain) {
-    host.nodes[MediaScript::kMotion].params[1] = 150.0F;
-    const FrameLeafRef leaves[] = {Leaf(kBelow), Leaf(Plain(80, 36, {1.0, 0.0, 0.0, 1.0}))};
-    CountAllocations();
-    static_cast<void>(Render(*Adjust(leaves[0], leaves[1])));
-    ASSERT_EQ(allocations, 4) << "the copy, the processed picture, the matte, the moved matte";
-    for (int refused = 1; refused <= 4; ++refused) {
-        SCOPED_TRACE(refused);
-        CountAllocations([refused](int number) { return number == refused; });
-        EXPECT_TRUE(PicturesAgree(Download(Render(*Adjust(leaves[0], leaves[1]))), kAbove, {2e-3}));
-    }
-    CountAllocations([](int number) { return number > 1; });
-    VideoFrameRef frame;
-    EXPECT_EQ(Render(*Adjust(leaves[0], leaves[1]), frame), Ostrand::kStatus_OutOfMemory);
-    EXPECT_FALSE(frame);
-}
-
 INSTANTIATE_TEST_SUITE_P(OnEachDevice, AdjustmentDevice, testing::ValuesIn(AllDeviceCases()), NameOfCase);
 
 }  // namespace

@@ -187,16 +187,6 @@ TEST_P(IntrinsicDevice, TheFingerprintFollowsTheMotion) {
     EXPECT_TRUE(Layer(Leaf(kRed))->GetFrameHash(script.params, results).IsNil());
 }
 
-TEST_P(IntrinsicDevice, MoreInputsOrNoneFail) {
-    const FrameLeafRef leaf = Leaf(kRed);
-    const RenderNodeRef layer = Layer(leaf);
-    layer->SetInput(1, leaf);
-    VideoFrameRef frame;
-    EXPECT_EQ(Render(*layer, frame), Ostrand::kStatus_Failure);
-    EXPECT_EQ(leaf->renders, 0);
-    EXPECT_EQ(Render(*Layer({}, false, true), frame), Ostrand::kStatus_Failure);
-}
-
 INSTANTIATE_TEST_SUITE_P(OnEachDevice, CompositorDevice, testing::ValuesIn(AllDeviceCases()), NameOfCase);
 INSTANTIATE_TEST_SUITE_P(OnEachDevice, IntrinsicDevice, testing::ValuesIn(AllDeviceCases()), NameOfCase);
 

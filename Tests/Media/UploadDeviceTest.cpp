@@ -1,7 +1,6 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
 #include <sstream>
-#include <thread>
 
 #include "Src/Filters/HostRenderSubtreeNode.h"
 #include "Src/Filters/MediaNode.h"
@@ -70,16 +69,6 @@ TEST_P(UploadDevice, AHostFrameComesThroughConverted) {
     ExpectPixel(opaque, {17 / 255.0, 9 / 255.0, 1.0, 1.0}, 17, 9);
     EXPECT_EQ(opaque->GetPixelAspectRatio(), Vellum::PixelAspectRatio({10, 11}));
     EXPECT_EQ(opaque->GetOrigin(), Vellum::Point({0, 1}));
-}
-
-TEST_P(UploadDevice, AMatteColorIsTakenOut) {
-    // Red over a blue matte at half coverage.
-    ShowColor({128, 0, 128, 128});
-    script.Set({{"MediaNode::StreamAlphaType", "2"}, {"MediaNode::StreamAlphaMatteColor", "255"}});
-    const Pixel pixel = PixelOf(Play(*MakeMedia<Upload>()));
-    EXPECT_NEAR(pixel[0], 0.0, 0.01);
-    EXPECT_NEAR(pixel[2], 1.0, 0.01);
-    EXPECT_NEAR(pixel[3], 128 / 255.0, 1e-3);
 }
 
 TEST_P(UploadDevice, AFieldIsTakenFromItsOwnLines) {
@@ -202,51 +191,6 @@ TEST_P(UploadDevice, PicturesWithoutAFingerprintArentShared) {
     EXPECT_EQ(upload->FetchHostFrame({}, script.params, results, false, frame), 0);
     EXPECT_EQ(results->GetOutstanding(), 1U) << "nothing is staged";
     ExpectPixel(MediaDeviceTest::Render(*upload), {10 / 255.0, 20 / 255.0, 30 / 255.0, 1.0});
-}
-
-TEST_P(UploadDevice, FramesAreStagedWhileEarlierOnesRender) {
-    host.renderer.delivery = FakeRenderer::Delivery::kOnAThread;
-    host.renderer.paint = [](const FakeRequest& request) {
-        const auto level = static_cast<std::uint8_t>(request.time / MediaScript::kFrameTicks);
-        return Paint(64, 36, [level](int, int) -> std::array<std::uint8_t, 4> { return {level, 0, 0, 255}; });
-    };
-    const auto media = MakeMedia<ClipMedia>();
-    constexpr int kFrames = 12;
-    struct Prepared {
-        RenderParams params;
-        RenderResultsRef results;
-        std::atomic<bool> complete{false};
-    };
-    std::vector<Prepared> frames(kFrames);
-    std::thread preparing([&] {
-        for (int i = 0; i < kFrames; ++i) {
-            Prepared& frame = frames[static_cast<std::size_t>(i)];
-            frame.params = script.params;
-            frame.params.time = frame.params.clipTime = i * MediaScript::kFrameTicks;
-            frame.results = boost::make_shared<RenderResults>([&frame] { frame.complete = true; }, 1);
-            EXPECT_EQ(media->RequestHostFrames(frame.params, frame.results), 0);
-        }
-        for (Prepared& frame : frames) {
-            // The host's frame must be there before it can be staged; a host that prepares early just stages less.
-            while (frame.results->GetOutstanding() > 1) std::this_thread::yield();
-            VideoFrameRef staged;
-            EXPECT_EQ(media->FetchHostFrame({}, frame.params, frame.results, false, staged), 0);
-            frame.results->EndAsyncPiece();
-        }
-    });
-    preparing.join();
-    for (std::size_t i = 0; i < frames.size(); ++i) {
-        // Every other frame is rendered without waiting: its copy is awaited, or done on this thread.
-        while (i % 2 == 0 && !frames[i].complete) std::this_thread::yield();
-        VideoFrameRef frame;
-        EXPECT_EQ(media->RenderFrame({}, frames[i].params, frames[i].results, frame), 0);
-        ExpectPixel(frame, {static_cast<double>(i) / 255.0, 0.0, 0.0, 1.0});
-        media->EndFrame({}, frames[i].params, frames[i].results, 0);
-    }
-    for (const Prepared& frame : frames) {
-        while (!frame.complete) std::this_thread::yield();
-    }
-    EXPECT_EQ(host.Count("RenderClip"), kFrames);
 }
 
 TEST_P(UploadDevice, TimingsNameTheSourceAndTheStages) {

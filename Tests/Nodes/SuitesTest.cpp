@@ -2,7 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "Src/Outside/Suites.h"
 
-#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include "Tests/Support/FakeHost.h"
 

@@ -1,6 +1,6 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
-#include <gmock/gmock.h>
+#include <gtest/gtest.h>
 
 #include "Tests/Timeline/TimelineTester.h"
 
@@ -69,28 +69,6 @@ TEST_F(NestedSequence, WithoutANodeForItThePiecesGoIntoTheMaps) {
     EXPECT_EQ(InfoAt(900).out, 1000);
 }
 
-TEST_F(NestedSequence, OnlyAPlainClipOfMatchingMediaIsFlattened) {
-    refused.insert("NestedTimelineNode");
-    unregistered.insert("NestedTimelineNode");
-    const struct {
-        std::uint32_t node;
-        const char* key;
-        const char* value;
-    } obstacles[] = {{510, "MediaNode::StreamFrameHeight", "72"}, {510, "MediaNode::StreamFrameRate", "5"},
-                     {510, "MediaNode::ClipSpeed", "0.5"},        {10, "ClipNode::ClipSpeed", "2"},
-                     {10, "ClipNode::ClipBackwards", "1"},        {10, "ClipNode::TimeRemapping", "x"},
-                     {10, "ClipNode::FrameHoldAtTime", "0"}};
-    for (const auto& obstacle : obstacles) {
-        auto& properties = host.nodes[obstacle.node].properties;
-        const auto before = properties;
-        properties[obstacle.key] = obstacle.value;
-        const SegmentInfo info = Build(10);
-        EXPECT_EQ(Describe(info.tree), "HostRenderSource") << obstacle.key;
-        EXPECT_TRUE(info.hostWhole && info.hostPart);
-        properties = before;
-    }
-}
-
 TEST_F(NestedSequence, WhenItCannotBeReadItsSegmentHasNoEntry) {
     host.sequences[kInner].infoFails = true;
     AddPlainClip(13);
@@ -115,23 +93,6 @@ TEST_F(NestedSequence, OneThatContainsItselfIsBlackThere) {
         EXPECT_TRUE(endless.segmentTrees.empty());
         EXPECT_EQ(Describe(endless.defaultTree), "BlackVideoSource");
     }
-}
-
-TEST_F(NestedSequence, NestingMayBeTwentyDeep) {
-    constexpr std::uint32_t kDepth = 20;
-    host.nodes[510].properties["MediaNode::NestedSequenceTimelineID"] = "100";
-    for (std::uint32_t id = 100; id < 100 + kDepth; ++id) {
-        AddNestedClip(id);
-        host.nodes[id + 500].properties["MediaNode::NestedSequenceTimelineID"] = std::to_string(id + 1);
-        AddSegment(id, 0, 1000, id);
-    }
-    AddSegment(100 + kDepth, 0, 1000, 11);
-    RenderNodeRef tree = Build(10).tree;
-    for (std::uint32_t depth = 0; depth <= kDepth; ++depth) {
-        ASSERT_EQ(Probe(tree).segmentTrees.size(), 1U) << depth;
-        tree = Probe(tree).segmentTrees[0].tree;
-    }
-    EXPECT_EQ(Describe(tree), "TQ.XQVE Motion(Blur(Blur(HostRenderClip)))");
 }
 
 }  // namespace

@@ -134,16 +134,6 @@ TEST_F(TimelineUpdate, AChildStartsWithTheParentsTrees) {
     EXPECT_EQ(ofParent.in, 0) << "the parent's own segments stay";
 }
 
-TEST_F(TimelineUpdate, AnEntryThatLiesBehindWhatWasReachedIsPassedOver) {
-    AddPlainClip(10);
-    AddPlainClip(11);
-    AddSegment(kTop, 0, 100, 10);
-    AddSegment(kTop, 20, 100, 11);
-    Read();
-    EXPECT_EQ(InfoAt(50).guid, NumberedGuid(10));
-    EXPECT_EQ(InfoAt(100).in, 100);
-}
-
 TEST_F(TimelineUpdate, FailuresLeaveTheMapsAloneAndTheNextUpdateReadsAnew) {
     AddPlainClip(10);
     AddSegment(kTop, 0, 100, 10);
@@ -208,15 +198,6 @@ TEST_F(TimelineUpdate, ReadersSeeOneUpdateOrTheNext) {
     }
     done = true;
     reader.join();
-}
-
-TEST_F(TimelineUpdate, PreviewListsAreReadByTheirOwnEntries) {
-    AddNestedClip(10);
-    AddSegment(kTop, 0, 100, 10);
-    Read(true);
-    EXPECT_EQ(host.Count("AcquireVideoSegmentsWithPreviews"), 1);
-    EXPECT_EQ(host.Count("AcquireNestedVideoSegmentsWithPreviews"), 1);
-    EXPECT_EQ(host.Count("AcquireVideoSegments"), 0);
 }
 
 TEST_F(TimelineUpdate, TreesWithANestedSequenceAreNeverTakenOver) {
