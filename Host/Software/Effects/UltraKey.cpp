@@ -98,9 +98,10 @@ public:
         const double amount = std::max(2.0 * mControls.spill, 0.0);
         const double light = std::min(amount, 1.0) * spilt * mPerChroma;
         const double lit = Limit(light / mKey.luma / expected, 0.0, 1.0);
-        const double gain = 1.0 + 2.0 * mControls.luma * lit / std::max(1.0 - lit, 0.125);
-        const double colorGain = gain * (1.0 - OverRamp(screen, mControls.desaturate));
         const double luma = c.luma > 0.0 ? std::max(c.luma - light, 0.0) : c.luma;
+        const double gain =
+            std::min(Restored(lit), std::max(Restored(std::min(lit, screen)), c.luma / std::max(luma, 1e-30)));
+        const double colorGain = gain * (1.0 - OverRamp(screen, mControls.desaturate));
         const Light result = CorrectColor(
             {ToLight({(c.u - amount * spilt * mU) * colorGain, (c.v - amount * spilt * mV) * colorGain, luma * gain})},
             mControls);
@@ -121,6 +122,9 @@ private:
                              std::max(darkest - 1.0, 0.0) * (1.0 - bright);
         const double above = 1.0 + 2.0 * mControls.highlight * (share - share / bright);
         return Limit(bright < 1.0 ? below : above, 1.0 / 16.0, 1e30);
+    }
+    [[nodiscard]] double Restored(double lit) const {
+        return 1.0 + 2.0 * mControls.luma * lit / std::max(1.0 - lit, 0.125);
     }
     [[nodiscard]] double Matte(double screen) const {
         const double clear = OverRamp(screen, mTransparency);

@@ -68,11 +68,13 @@ enum UltraKeyOutput : std::int32_t {
 ///
 ///     spilt = part(ramp(range)),  taken = 2 spill spilt,  light = min(1, 2 spill) spilt / |K chroma| * K.y
 ///     along' = along - taken,  y' = y - light (not below 0)
-///     lit = light / K.y / expected, limited to 0..1,  all three times 1 + 2 luma lit / max(1 - lit, 1/8)
+///     lit = light / K.y / expected, limited to 0..1,  restored(l) = 1 + 2 luma l / max(1 - l, 1/8)
+///     all three times min(restored(lit), max(restored(min(lit, screen)), y / y'))
 ///     chroma loses min(1, screen / ramp(desaturate)) of itself
 ///
-/// and at last go through a matrix: saturation, a turn of hue that keeps luma, and a gain luminance^2.2. A colour that
-/// none of this concerns keeps its bits. A key without a hue (chroma below a thousandth of luma) keys nothing.
+/// so that what is opaque never gets brighter than it was, and at last go through a matrix: saturation, a turn of hue
+/// that keeps luma, and a gain luminance^2.2. A colour that none of this concerns keeps its bits. A key without a hue
+/// (chroma below a thousandth of luma) keys nothing.
 inline constexpr ParameterRow kUltraKeyParameters[] = {
     {0,
      "output",
@@ -95,7 +97,7 @@ inline constexpr ParameterRow kUltraKeyParameters[] = {
     UltraKeyParameter(13, "contrast", 0, "of the matte, about the mid point"),
     UltraKeyParameter(14, "mid_point", 50, "stays under contrast"),
     UltraKeyParameter(17, "desaturate", 25, "of what is nearly transparent"),
-    UltraKeyParameter(18, "range", 65, "how far from the key's hue is spill"),
+    UltraKeyParameter(18, "range", 50, "how far from the key's hue is spill: 50 to where another colour begins"),
     UltraKeyParameter(19, "spill", 50, "how much spill is taken; 50 all of it, above that the opposite shows"),
     UltraKeyParameter(20, "luma", 50, "how much brightness is given back for spill; 50 as it was mixed"),
     UltraKeyParameter(23, "saturation", 100, "of the colours", 200),
