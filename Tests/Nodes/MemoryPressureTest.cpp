@@ -98,11 +98,14 @@ TEST_F(MemoryPressureTest, RunningInputsAreLeftAloneAndFinishedOnesAreReleasedBy
 }
 
 TEST_F(MemoryPressureTest, RoomIsMadeFromFinishedInputsFirst) {
-    FinishedInputs::Append(deep, {}, stage.params, stage.results);
+    const ProbeLeafRef other = stage.Leaf("other");
+    for (const ProbeLeafRef& finished : {deep, other})
+        FinishedInputs::Append(finished, {}, stage.params, stage.results);
     memory.figures.gentleLimit = memory.figures.hardLimit = kNeed + 500;
-    Use(600, 100);
+    Use(700, 100);
+    other->onEnd = deep->onEnd;
     EXPECT_EQ(stage.Render(*node, frame), 0);
-    EXPECT_THAT(stage.log, Contains("deep EndFrame 3"));
+    EXPECT_THAT(stage.log, testing::AllOf(Contains("deep EndFrame 3"), Contains("other EndFrame 3")));
     EXPECT_THAT(stage.log, Not(Contains("leaf EndFrame 3"))) << "it fits again";
     EXPECT_TRUE(memory.cache.purges.empty());
 }
