@@ -195,7 +195,7 @@ CUresult cuDeviceGet(CUdevice* device, int ordinal) {
 CUresult cuDeviceGetName(char* name, int length, CUdevice device) {
     if (name == nullptr || length <= 0) return CUDA_ERROR_INVALID_VALUE;
     if (const CUresult result = NeedDevice(device); result != CUDA_SUCCESS) return result;
-    std::snprintf(name, static_cast<std::size_t>(length), "SoftCuda CPU device %d", device);
+    (void)std::snprintf(name, static_cast<std::size_t>(length), "SoftCuda CPU device %d", device);
     return CUDA_SUCCESS;
 }
 

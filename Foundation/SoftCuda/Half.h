@@ -18,13 +18,13 @@ static inline __attribute__((always_inline)) float HalfToFloat(std::uint16_t hal
     constexpr float kRebias = 0x1p112F;
     const std::uint32_t magnitude = static_cast<std::uint32_t>(half & 0x7FFFU) << 13;
     const float scaled = __builtin_bit_cast(float, magnitude) * kRebias;
-    std::uint32_t bits = __builtin_bit_cast(std::uint32_t, scaled);
+    auto bits = __builtin_bit_cast(std::uint32_t, scaled);
     bits = magnitude >= 0x0F800000U ? (magnitude | 0x7F800000U) : bits;
     return __builtin_bit_cast(float, bits | (static_cast<std::uint32_t>(half & 0x8000U) << 16));
 }
 
 static inline __attribute__((always_inline)) std::uint16_t FloatToHalf(float value) {
-    const std::uint32_t bits = __builtin_bit_cast(std::uint32_t, value);
+    const auto bits = __builtin_bit_cast(std::uint32_t, value);
     const std::uint32_t sign = (bits >> 16) & 0x8000U;
     const std::uint32_t magnitude = bits & 0x7FFFFFFFU;
     // Adding one half aligns a subnormal's last place with the float's, so the addition does the rounding.

@@ -32,9 +32,13 @@ int CountProcessors() {
 
 bool HasLevel(int level) {
     __builtin_cpu_init();
-    if (level == 2) return __builtin_cpu_supports("x86-64-v4") != 0;
-    if (level == 1) return __builtin_cpu_supports("x86-64-v3") != 0;
-    return true;
+    // The levels by name are unknown to some compilers. Processors with these have the rest of their level as well.
+    const bool has3 = __builtin_cpu_supports("avx2") != 0 && __builtin_cpu_supports("fma") != 0 &&
+                      __builtin_cpu_supports("bmi") != 0 && __builtin_cpu_supports("bmi2") != 0;
+    const bool has4 = __builtin_cpu_supports("avx512f") != 0 && __builtin_cpu_supports("avx512bw") != 0 &&
+                      __builtin_cpu_supports("avx512cd") != 0 && __builtin_cpu_supports("avx512dq") != 0 &&
+                      __builtin_cpu_supports("avx512vl") != 0;
+    return level == 0 || (has3 && (level == 1 || has4));
 }
 
 }  // namespace

@@ -48,11 +48,15 @@ std::uint64_t Stream::Submit(std::function<void()> work, std::vector<StreamPoint
 }
 
 std::uint64_t Stream::Submit(const Launch& launch, std::vector<StreamPoint> after) {
-    return Push({nullptr, std::make_unique<Launch>(launch), nullptr, nullptr, std::move(after)});
+    Item item{nullptr, nullptr, nullptr, nullptr, std::move(after)};
+    item.launch = std::make_unique<Launch>(launch);
+    return Push(std::move(item));
 }
 
 std::uint64_t Stream::Submit(SmallCopy copy, std::vector<StreamPoint> after) {
-    return Push({nullptr, nullptr, std::make_unique<SmallCopy>(std::move(copy)), nullptr, std::move(after)});
+    Item item{nullptr, nullptr, nullptr, nullptr, std::move(after)};
+    item.copy = std::make_unique<SmallCopy>(std::move(copy));
+    return Push(std::move(item));
 }
 
 std::uint64_t Stream::Submit(Stamp stamp, std::vector<StreamPoint> after) {

@@ -14,15 +14,16 @@ namespace SoftCuda {
 
 namespace {
 
+constexpr std::ptrdiff_t kPlane = kPlaneStride;
 constexpr std::ptrdiff_t kHalfPixel = 8;
 constexpr std::ptrdiff_t kFloatPixel = 16;
 
 void PutPixel(float* planes, int i, HalfVector4 pixel) {
-    for (int plane = 0; plane < 4; ++plane) planes[plane * kPlaneStride + i] = pixel[plane];
+    for (int plane = 0; plane < 4; ++plane) planes[plane * kPlane + i] = pixel[plane];
 }
 
 HalfVector4 GetPixel(const float* planes, int i) {
-    return HalfVector4{planes[i], planes[kPlaneStride + i], planes[2 * kPlaneStride + i], planes[3 * kPlaneStride + i]};
+    return HalfVector4{planes[i], planes[kPlane + i], planes[2 * kPlane + i], planes[3 * kPlane + i]};
 }
 
 void LoadFloatTail(float* planes, const std::uint8_t* pixels, int first, int count) {
@@ -68,9 +69,9 @@ void LoadFloat(float* planes, const std::uint8_t* pixels, int count) {
         const __m256d cd0 = _mm256_castps_pd(_mm256_unpacklo_ps(c, d)),
                       cd1 = _mm256_castps_pd(_mm256_unpackhi_ps(c, d));
         _mm256_store_ps(planes + i, _mm256_castpd_ps(_mm256_unpacklo_pd(ab0, cd0)));
-        _mm256_store_ps(planes + kPlaneStride + i, _mm256_castpd_ps(_mm256_unpackhi_pd(ab0, cd0)));
-        _mm256_store_ps(planes + 2 * kPlaneStride + i, _mm256_castpd_ps(_mm256_unpacklo_pd(ab1, cd1)));
-        _mm256_store_ps(planes + 3 * kPlaneStride + i, _mm256_castpd_ps(_mm256_unpackhi_pd(ab1, cd1)));
+        _mm256_store_ps(planes + kPlane + i, _mm256_castpd_ps(_mm256_unpackhi_pd(ab0, cd0)));
+        _mm256_store_ps(planes + 2 * kPlane + i, _mm256_castpd_ps(_mm256_unpacklo_pd(ab1, cd1)));
+        _mm256_store_ps(planes + 3 * kPlane + i, _mm256_castpd_ps(_mm256_unpackhi_pd(ab1, cd1)));
     }
     LoadFloatTail(planes, pixels, i, count);
 }
@@ -89,9 +90,8 @@ void StoreFloat(std::uint8_t* pixels, const float* planes, int count) {
     if (kFresh && (reinterpret_cast<std::uintptr_t>(pixels) & 31U) != 0)
         return StoreFloat<false>(pixels, planes, count);
     for (; i + kGroup <= count; i += kGroup) {
-        const __m256 x = _mm256_load_ps(planes + i), y = _mm256_load_ps(planes + kPlaneStride + i);
-        const __m256 z = _mm256_load_ps(planes + 2 * kPlaneStride + i),
-                     w = _mm256_load_ps(planes + 3 * kPlaneStride + i);
+        const __m256 x = _mm256_load_ps(planes + i), y = _mm256_load_ps(planes + kPlane + i);
+        const __m256 z = _mm256_load_ps(planes + 2 * kPlane + i), w = _mm256_load_ps(planes + 3 * kPlane + i);
         const __m256d xy0 = _mm256_castps_pd(_mm256_unpacklo_ps(x, y)),
                       xy1 = _mm256_castps_pd(_mm256_unpackhi_ps(x, y));
         const __m256d zw0 = _mm256_castps_pd(_mm256_unpacklo_ps(z, w)),
@@ -120,9 +120,9 @@ void LoadHalf(float* planes, const std::uint8_t* pixels, int count) {
         const __m128i xy0 = _mm_unpacklo_epi16(even0, odd0), zw0 = _mm_unpackhi_epi16(even0, odd0);
         const __m128i xy1 = _mm_unpacklo_epi16(even1, odd1), zw1 = _mm_unpackhi_epi16(even1, odd1);
         _mm256_store_ps(planes + i, _mm256_cvtph_ps(_mm_unpacklo_epi64(xy0, xy1)));
-        _mm256_store_ps(planes + kPlaneStride + i, _mm256_cvtph_ps(_mm_unpackhi_epi64(xy0, xy1)));
-        _mm256_store_ps(planes + 2 * kPlaneStride + i, _mm256_cvtph_ps(_mm_unpacklo_epi64(zw0, zw1)));
-        _mm256_store_ps(planes + 3 * kPlaneStride + i, _mm256_cvtph_ps(_mm_unpackhi_epi64(zw0, zw1)));
+        _mm256_store_ps(planes + kPlane + i, _mm256_cvtph_ps(_mm_unpackhi_epi64(xy0, xy1)));
+        _mm256_store_ps(planes + 2 * kPlane + i, _mm256_cvtph_ps(_mm_unpacklo_epi64(zw0, zw1)));
+        _mm256_store_ps(planes + 3 * kPlane + i, _mm256_cvtph_ps(_mm_unpackhi_epi64(zw0, zw1)));
     }
     LoadHalfTail(planes, pixels, i, count);
 }
@@ -135,8 +135,8 @@ void StoreHalf(std::uint8_t* pixels, const float* planes, int count) {
         return _mm256_cvtps_ph(_mm256_load_ps(plane), _MM_FROUND_TO_NEAREST_INT);
     };
     for (; i + kGroup <= count; i += kGroup) {
-        const __m128i x = halves(planes + i), y = halves(planes + kPlaneStride + i);
-        const __m128i z = halves(planes + 2 * kPlaneStride + i), w = halves(planes + 3 * kPlaneStride + i);
+        const __m128i x = halves(planes + i), y = halves(planes + kPlane + i);
+        const __m128i z = halves(planes + 2 * kPlane + i), w = halves(planes + 3 * kPlane + i);
         const __m128i xy0 = _mm_unpacklo_epi16(x, y), xy1 = _mm_unpackhi_epi16(x, y);
         const __m128i zw0 = _mm_unpacklo_epi16(z, w), zw1 = _mm_unpackhi_epi16(z, w);
         const auto pair = [](__m128i xy, __m128i zw) {
@@ -151,7 +151,7 @@ void StoreHalf(std::uint8_t* pixels, const float* planes, int count) {
 
 void RoundStrip(float* planes, int count) {
     for (int plane = 0; plane < 4; ++plane) {
-        float* values = planes + plane * kPlaneStride;
+        float* values = planes + plane * kPlane;
         for (int i = 0; i < count; i += kGroup)
             _mm256_store_ps(values + i,
                             _mm256_cvtph_ps(_mm256_cvtps_ph(_mm256_load_ps(values + i), _MM_FROUND_TO_NEAREST_INT)));
@@ -177,9 +177,9 @@ void LoadFloat(float* planes, const std::uint8_t* pixels, int count) {
         __m128 a = _mm_loadu_ps(p), b = _mm_loadu_ps(p + 4), c = _mm_loadu_ps(p + 8), d = _mm_loadu_ps(p + 12);
         _MM_TRANSPOSE4_PS(a, b, c, d);
         _mm_store_ps(planes + i, a);
-        _mm_store_ps(planes + kPlaneStride + i, b);
-        _mm_store_ps(planes + 2 * kPlaneStride + i, c);
-        _mm_store_ps(planes + 3 * kPlaneStride + i, d);
+        _mm_store_ps(planes + kPlane + i, b);
+        _mm_store_ps(planes + 2 * kPlane + i, c);
+        _mm_store_ps(planes + 3 * kPlane + i, d);
     }
     LoadFloatTail(planes, pixels, i, count);
 }
@@ -190,8 +190,8 @@ void StoreFloat(std::uint8_t* pixels, const float* planes, int count) {
     if (kFresh && (reinterpret_cast<std::uintptr_t>(pixels) & 15U) != 0)
         return StoreFloat<false>(pixels, planes, count);
     for (; i + kGroup <= count; i += kGroup) {
-        __m128 a = _mm_load_ps(planes + i), b = _mm_load_ps(planes + kPlaneStride + i);
-        __m128 c = _mm_load_ps(planes + 2 * kPlaneStride + i), d = _mm_load_ps(planes + 3 * kPlaneStride + i);
+        __m128 a = _mm_load_ps(planes + i), b = _mm_load_ps(planes + kPlane + i);
+        __m128 c = _mm_load_ps(planes + 2 * kPlane + i), d = _mm_load_ps(planes + 3 * kPlane + i);
         _MM_TRANSPOSE4_PS(a, b, c, d);
         std::uint8_t* p = pixels + i * kFloatPixel;
         Put<kFresh>(p, a);
@@ -212,7 +212,7 @@ void StoreHalf(std::uint8_t* pixels, const float* planes, int count) {
 void RoundStrip(float* planes, int count) {
     for (int plane = 0; plane < 4; ++plane)
         for (int i = 0; i < count; ++i) {
-            float& value = planes[plane * kPlaneStride + i];
+            float& value = planes[plane * kPlane + i];
             value = HalfToFloat(FloatToHalf(value));
         }
 }

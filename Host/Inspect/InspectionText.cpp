@@ -47,8 +47,8 @@ private:
         const SequenceFormat& format = mInspection.format;
         const double rate = static_cast<double>(Vellum::kTicksPerSecond) / static_cast<double>(format.frameTicks);
         char text[160];
-        std::snprintf(text, sizeof text, ": %dx%d, %.6g fps, %lld frames, on %s (", format.width, format.height, rate,
-                      static_cast<long long>(mInspection.GetFrameCount()), mInspection.framework.c_str());
+        (void)std::snprintf(text, sizeof text, ": %dx%d, %.6g fps, %lld frames, on %s (", format.width, format.height,
+                            rate, static_cast<long long>(mInspection.GetFrameCount()), mInspection.framework.c_str());
         mText += mInspection.file + text + mInspection.deviceName + ")\n\n";
     }
 
@@ -122,7 +122,7 @@ private:
             const double percent =
                 100.0 * static_cast<double>(mInspection.CountFrames(rendering)) / static_cast<double>(mFrames);
             char text[64];
-            std::snprintf(text, sizeof text, " %s %.0f%%   ", LookOf(rendering).legend, percent);
+            (void)std::snprintf(text, sizeof text, " %s %.0f%%   ", LookOf(rendering).legend, percent);
             mText += text;
         }
         mText += mColors ? "/ not real time\n" : "small letters: not real time\n";
@@ -137,15 +137,15 @@ private:
             if (stretch.CountFrames() == 0) continue;
             const SegmentInfo& info = stretch.info;
             char text[200];
-            std::snprintf(text, sizeof text, "%3zu %6lld %7lld  %-12s %-12s ", number++,
-                          static_cast<long long>(stretch.firstFrame), static_cast<long long>(stretch.CountFrames()),
-                          mInspection.GetTimecode(stretch.firstFrame).c_str(),
-                          mInspection.GetTimecode(stretch.endFrame).c_str());
+            (void)std::snprintf(
+                text, sizeof text, "%3zu %6lld %7lld  %-12s %-12s ", number++,
+                static_cast<long long>(stretch.firstFrame), static_cast<long long>(stretch.CountFrames()),
+                mInspection.GetTimecode(stretch.firstFrame).c_str(), mInspection.GetTimecode(stretch.endFrame).c_str());
             mText += text;
             Name(stretch.rendering);
             if (stretch.rendering != Rendering::kGap) {
-                std::snprintf(text, sizeof text, "%-9s %8d %7d %12d %7d", info.realTime ? "yes" : "no",
-                              info.effectCount, info.intrinsicCount, info.transitionCount, info.layerCount);
+                (void)std::snprintf(text, sizeof text, "%-9s %8d %7d %12d %7d", info.realTime ? "yes" : "no",
+                                    info.effectCount, info.intrinsicCount, info.transitionCount, info.layerCount);
                 mText += text;
             }
             mText.erase(mText.find_last_not_of(' ') + 1);
@@ -156,7 +156,7 @@ private:
 
     void Name(Rendering rendering) {
         char text[32];
-        std::snprintf(text, sizeof text, "%-12s ", GetName(rendering));
+        (void)std::snprintf(text, sizeof text, "%-12s ", GetName(rendering));
         if (!mColors) {
             mText += text;
             return;

@@ -28,7 +28,7 @@ std::string FileNameOf(const std::string& path) { return path.substr(path.rfind(
 
 std::string TextOf(double number) {
     char text[32];
-    std::snprintf(text, sizeof text, "%.6g", number);
+    (void)std::snprintf(text, sizeof text, "%.6g", number);
     return text;
 }
 

@@ -1,7 +1,8 @@
 // SPDX-FileCopyrightText: The Vantrel contributors
 // SPDX-License-Identifier: Apache-2.0
 #include <algorithm>
-#include <cstdio>
+#include <cmath>
+#include <cstdlib>
 #include <map>
 #include <sstream>
 
@@ -59,7 +60,7 @@ void TakePicture(PixelBufferPool& pool, const HostPicture& picture, const Sequen
     const double aspect = static_cast<double>(format.width) * format.aspectNumerator /
                           (static_cast<double>(format.height) * format.aspectDenominator);
     frame.width = std::min(kPictureWidth, picture.width);
-    frame.height = std::max(1, static_cast<std::int32_t>(frame.width / aspect + 0.5));
+    frame.height = std::max(1, static_cast<std::int32_t>(std::lround(frame.width / aspect)));
     OutputFormat output;
     output.path = "picture of frame " + std::to_string(frame.frame);
     output.width = frame.width;
@@ -90,17 +91,19 @@ void ReadTimings(const std::string& report, StretchFrame& frame, TreeNode& tree)
     std::istringstream lines(report);
     for (std::string line; std::getline(lines, line);) {
         const std::size_t colon = line.rfind(": ");
-        double value = 0;
-        char unit[3] = {};
-        if (colon == std::string::npos || std::sscanf(line.c_str() + colon + 2, "%lf%2s", &value, unit) != 2) continue;
+        if (colon == std::string::npos) continue;
+        char* unitStart = nullptr;
+        const double value = std::strtod(line.c_str() + colon + 2, &unitStart);
+        const std::string unit(unitStart);
         // Further lines of a node's, which tell what its time is made of.
         if (line[0] == ' ') continue;
         const std::string name = line.substr(0, colon);
-        if (std::string(unit) == "mb") {
-            std::sscanf(line.c_str(), "Memory: %lfmb", &frame.deviceMegabytes);
+        if (unit.rfind("mb", 0) == 0) {
+            // The line goes on with the host's.
+            frame.deviceMegabytes = std::strtod(line.c_str() + line.find(": ") + 2, nullptr);
         } else if (name == "Total render time") {
             frame.totalMilliseconds = value;
-        } else if (std::string(unit) == "ms") {
+        } else if (unit.rfind("ms", 0) == 0) {
             frame.timings.push_back({name, value});
         }
     }

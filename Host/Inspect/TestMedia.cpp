@@ -67,6 +67,7 @@ std::vector<TestMediaPlan> PlanTestMedia(const Document& document) {
     std::map<std::string, TestMediaPlan> plans;
     Collect(document.tracks, FirstFrameTicks(document.tracks), plans);
     std::vector<TestMediaPlan> result;
+    result.reserve(plans.size());
     for (const auto& [name, plan] : plans) result.push_back(plan);
     return result;
 }

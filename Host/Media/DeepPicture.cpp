@@ -145,6 +145,7 @@ bool ConvertDeepPicture(const AVFrame& frame, const LumaWeights& weights, bool f
     const bool hasAlpha = (format->flags & AV_PIX_FMT_FLAG_ALPHA) != 0;
     const auto width = static_cast<std::size_t>(frame.width);
     std::vector<ComponentReader> readers;
+    readers.reserve(static_cast<std::size_t>(format->nb_components));
     for (int i = 0; i < format->nb_components; ++i) readers.emplace_back(frame, *format, i);
     // Red, green, blue, alpha; or luma, chroma twice, alpha.
     std::vector<float> lines[4];

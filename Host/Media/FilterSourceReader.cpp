@@ -2,6 +2,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "Host/Media/FilterSourceReader.h"
 
+#include <utility>
+
 extern "C" {
 #include <libavfilter/buffersink.h>
 #include <libavutil/opt.h>
@@ -20,9 +22,8 @@ bool LeavesOpen(const AVFilter& filter, const std::string& text, const char* opt
 
 }  // namespace
 
-FilterSourceReader::FilterSourceReader(const std::string& source, std::int32_t width, std::int32_t height,
-                                       AVRational rate)
-    : mSource(source), mWidth(width), mHeight(height), mRate(rate) {
+FilterSourceReader::FilterSourceReader(std::string source, std::int32_t width, std::int32_t height, AVRational rate)
+    : mSource(std::move(source)), mWidth(width), mHeight(height), mRate(rate) {
     Start();
 }
 

@@ -20,7 +20,7 @@ class FilterSourceReader {
 public:
     /// Options that the text leaves open are set to the size and rate given, where the filter has them. Throws
     /// MediaError for a name that isn't a source of pictures, and for options that it refuses.
-    FilterSourceReader(const std::string& source, std::int32_t width, std::int32_t height, AVRational rate);
+    FilterSourceReader(std::string source, std::int32_t width, std::int32_t height, AVRational rate);
 
     [[nodiscard]] std::int32_t GetWidth() const;
     [[nodiscard]] std::int32_t GetHeight() const;

@@ -164,7 +164,7 @@ void PictureConverter::ConvertDeep(const AVFrame& frame, HostPicture& picture) {
                                                            static_cast<std::ptrdiff_t>(mPlanar->linesize[plane]) * y);
         }
         auto* row = reinterpret_cast<float*>(picture.GetRow(y));
-        for (std::int32_t x = 0; x < frame.width; ++x) {
+        for (std::ptrdiff_t x = 0; x < frame.width; ++x) {
             row[4 * x] = planes[1][x];
             row[4 * x + 1] = planes[0][x];
             row[4 * x + 2] = planes[2][x];

@@ -4,6 +4,7 @@
 
 #include <algorithm>
 #include <cmath>
+#include <cstddef>
 #include <cstdint>
 #include <vector>
 
@@ -73,21 +74,21 @@ ALWAYS_INLINE void SpreadChroma(const Line& line, int plane) {
     const auto nearWeight = static_cast<std::int16_t>(line.nearWeight);
     const auto farWeight = static_cast<std::int16_t>(4 - line.nearWeight);
     const int count = line.chromaWidth;
-    for (int x = 0; x < count; ++x) {
+    for (std::ptrdiff_t x = 0; x < count; ++x) {
         sums[x] = static_cast<std::int16_t>(near[x] * nearWeight + far[x] * farWeight - kChromaZero / 4);
     }
     sums[-1] = sums[0];
     sums[count] = sums[count - 1];
     std::int16_t* values = line.chroma[plane];
     if (!line.halfWidth) {
-        for (int x = 0; x < count; ++x) values[x] = static_cast<std::int16_t>(4 * sums[x]);
+        for (std::ptrdiff_t x = 0; x < count; ++x) values[x] = static_cast<std::int16_t>(4 * sums[x]);
     } else if (line.centred) {
-        for (int x = 0; x < count; ++x) {
+        for (std::ptrdiff_t x = 0; x < count; ++x) {
             values[2 * x] = static_cast<std::int16_t>(3 * sums[x] + sums[x - 1]);
             values[2 * x + 1] = static_cast<std::int16_t>(3 * sums[x] + sums[x + 1]);
         }
     } else {
-        for (int x = 0; x < count; ++x) {
+        for (std::ptrdiff_t x = 0; x < count; ++x) {
             values[2 * x] = static_cast<std::int16_t>(4 * sums[x]);
             values[2 * x + 1] = static_cast<std::int16_t>(2 * (sums[x] + sums[x + 1]));
         }
@@ -109,7 +110,7 @@ ALWAYS_INLINE void ConvertLineBody(const Line& line, const Factors& factors) {
     const Factors f = factors;
     constexpr int kHalf = 1 << (kColorBits - 1);
     const int width = line.width;
-    for (int x = 0; x < width; ++x) {
+    for (std::ptrdiff_t x = 0; x < width; ++x) {
         const auto level = static_cast<std::int16_t>((luma[x] - f.black) * (1 << kLumaBits));
         const auto cb = static_cast<std::int16_t>(cbs[x] * kSixteenthTo256th);
         const auto cr = static_cast<std::int16_t>(crs[x] * kSixteenthTo256th);

@@ -47,7 +47,8 @@ void ToByteRow(const std::byte* from, std::byte* to, std::int32_t count, bool op
     for (std::int32_t i = 0; i < 4 * count; ++i) {
         // Written so that NaN becomes 0.
         const float value = source[i] > 0.0F ? std::min(source[i], 1.0F) : 0.0F;
-        target[i] = static_cast<std::uint8_t>(value * 255.0F + 0.5F);
+        const float raised = value * 255.0F + 0.5F;
+        target[i] = static_cast<std::uint8_t>(raised);
     }
     if (!opaque) return;
     for (std::int32_t i = 0; i < count; ++i) target[4 * i + 3] = 255;

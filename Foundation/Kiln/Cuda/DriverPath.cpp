@@ -41,7 +41,7 @@ std::string FindCPUDriver() {
 
 std::string DecideDriverPath() {
     const char* wanted = std::getenv("KILN_CUDA_DRIVER");
-    const std::string choice = wanted ? wanted : "";
+    std::string choice = wanted ? wanted : "";
     if (choice == "none") return {};
     if (choice == "soft") return FindCPUDriver();
     if (!choice.empty()) return choice;

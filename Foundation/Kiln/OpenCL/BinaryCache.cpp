@@ -19,7 +19,7 @@ std::filesystem::path GetCacheFolder() {
         const char* value = std::getenv(name);
         return std::filesystem::path(value ? value : "");
     };
-    if (const auto folder = read("KILN_CACHE_DIR"); !folder.empty()) return folder;
+    if (auto folder = read("KILN_CACHE_DIR"); !folder.empty()) return folder;
     if (const auto folder = read("XDG_CACHE_HOME"); !folder.empty()) return folder / "vantrel";
     if (const auto folder = read("HOME"); !folder.empty()) return folder / ".cache" / "vantrel";
     return {};

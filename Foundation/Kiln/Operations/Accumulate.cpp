@@ -14,7 +14,7 @@ constexpr std::int32_t kBatch = 3;
 
 constexpr Kernel<PixelFormat, DeviceBuffer, std::int32_t, DeviceBuffer, std::int32_t, DeviceBuffer, std::int32_t,
                  DeviceBuffer, std::int32_t, float4, std::int32_t, std::int32_t, std::int32_t, std::int32_t, bool, bool>
-    kAccumulate{"..\\..\\Kiln\\Modules\\Accumulate", "AccumulateKernel"};
+    kAccumulate{R"(..\..\Kiln\Modules\Accumulate)", "AccumulateKernel"};
 
 }  // namespace
 
