@@ -29,7 +29,7 @@ std::uint64_t GentleShare(std::uint64_t limit) { return limit / 10 * 7; }
 // Staged pictures are soon made again, and a film seldom asks for one twice: a large cache of them would let it run
 // through fresh pages, which cost more than the copies into them, for minutes.
 std::uint64_t CacheShare(MemoryPool::Kind kind, std::uint64_t limit) {
-    return kind == MemoryPool::Kind::kDevice ? limit / 2 : limit / 16;
+    return kind == MemoryPool::Kind::kDevice ? limit / 2 : limit / 64;
 }
 
 }  // namespace
