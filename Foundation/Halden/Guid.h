@@ -4,6 +4,8 @@
 
 #include <array>
 #include <cstdint>
+#include <cstring>
+#include <functional>
 #include <string>
 #include <tuple>
 
@@ -50,3 +52,16 @@ struct Guid {
 };
 
 }  // namespace Halden::utility
+
+template <>
+struct std::hash<Halden::utility::Guid> {
+    std::size_t operator()(const Halden::utility::Guid& guid) const noexcept {
+        std::uint64_t halves[2];
+        static_assert(sizeof halves == sizeof guid, "the members leave no gaps");
+        std::memcpy(halves, &guid, sizeof guid);
+        // Most are made of hashes already; those that somebody counts up differ in few bits.
+        constexpr std::uint64_t kOdd = 0x9E3779B97F4A7C15U;
+        const std::uint64_t mixed = (halves[0] ^ (halves[1] * kOdd)) * kOdd;
+        return static_cast<std::size_t>(mixed ^ (mixed >> 32));
+    }
+};

@@ -7,6 +7,7 @@
 #include <memory>
 #include <mutex>
 #include <string>
+#include <unordered_map>
 
 #include "Host/Snapshot/Node.h"
 
@@ -37,7 +38,7 @@ private:
     mutable std::mutex mMutex;
     std::map<std::string, std::uint32_t> mTimelines{{"", 1}};
     std::map<std::string, std::uint32_t> mInstances;
-    std::map<Guid, ClipEntry> mClips;
+    std::unordered_map<Guid, ClipEntry> mClips;
     std::map<std::uint32_t, Guid> mClipIdentities;
 };
 

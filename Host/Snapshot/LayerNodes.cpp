@@ -121,6 +121,7 @@ NodePtr LayerNodes::LayerNode(const ActiveLayer& layer, const MatteLookup& matte
 
 NodePtr LayerNodes::CompositorOf(const std::vector<Stacked>& layers, std::int64_t origin) const {
     std::vector<NodeInput> inputs;
+    inputs.reserve(layers.size());
     for (const Stacked& layer : layers) inputs.push_back({layer.anchor - origin, layer.node});
     return mFactory.Compositor(std::move(inputs));
 }

@@ -3,9 +3,9 @@
 #pragma once
 
 #include <cstdint>
-#include <map>
 #include <memory>
 #include <string>
+#include <unordered_map>
 #include <utility>
 #include <variant>
 #include <vector>
@@ -200,7 +200,7 @@ struct SegmentList {
     /// Of the format and of every segment's place and content.
     Guid hash;
     /// The segments' roots by their hash: made once, as the engine opens a list for every update and nesting.
-    std::map<Guid, NodePtr> roots;
+    std::unordered_map<Guid, NodePtr> roots;
 
     /// The segment that covers a time, or null.
     [[nodiscard]] const Segment* Find(std::int64_t time) const;

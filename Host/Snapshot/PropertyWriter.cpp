@@ -8,7 +8,7 @@ namespace Vantrel::Host {
 
 void PropertyWriter::Real(const char* key, double value) {
     char text[40];
-    std::snprintf(text, sizeof text, "%.17g", value);
+    (void)std::snprintf(text, sizeof text, "%.17g", value);
     Text(key, text);
 }
 

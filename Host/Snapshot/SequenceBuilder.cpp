@@ -72,6 +72,7 @@ std::vector<Segment> CutIntoSegments(const std::vector<TrackLayout>& tracks, con
 void Finish(SegmentList& list, const SequenceFormat& format) {
     list.hash = HashSegments(list.segments, format);
     list.roots.clear();
+    list.roots.reserve(list.segments.size());
     for (const Segment& segment : list.segments) list.roots.emplace(segment.root->hash, segment.root);
 }
 

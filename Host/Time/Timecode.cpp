@@ -13,9 +13,9 @@ std::string TimecodeOf(std::int64_t frame, std::int64_t ticksPerFrame) {
     const auto rate = static_cast<std::int64_t>(
         std::llround(static_cast<double>(Vellum::kTicksPerSecond) / static_cast<double>(ticksPerFrame)));
     char text[48];
-    std::snprintf(text, sizeof text, "%02lld:%02lld:%02lld:%02lld", static_cast<long long>(frame / rate / 3600),
-                  static_cast<long long>(frame / rate / 60 % 60), static_cast<long long>(frame / rate % 60),
-                  static_cast<long long>(frame % rate));
+    (void)std::snprintf(text, sizeof text, "%02lld:%02lld:%02lld:%02lld", static_cast<long long>(frame / rate / 3600),
+                        static_cast<long long>(frame / rate / 60 % 60), static_cast<long long>(frame / rate % 60),
+                        static_cast<long long>(frame % rate));
     return text;
 }
 

@@ -51,7 +51,7 @@ Multicam ReadMulticam(const JsonCursor& at) {
 
 std::string FormatDouble(double number) {
     char text[40];
-    std::snprintf(text, sizeof text, "%.17g", number);
+    (void)std::snprintf(text, sizeof text, "%.17g", number);
     return text;
 }
 

@@ -6,6 +6,7 @@
 #include <deque>
 #include <map>
 #include <set>
+#include <unordered_map>
 
 #include <boost/function.hpp>
 #include <boost/shared_ptr.hpp>
@@ -24,7 +25,7 @@ using IsRegisteredFunction = boost::function<bool(const Halden::WideString& key)
 
 /// Stretches by their in: none overlaps another.
 using SegmentMap = std::map<std::int64_t, SegmentInfo>;
-using TreeCache = std::map<Guid, SegmentVerdict>;
+using TreeCache = std::unordered_map<Guid, SegmentVerdict>;
 
 /// What a Timeline holds, and what reading and building work on. Everything here is used under `lock`, except
 /// topFormat.

@@ -26,8 +26,9 @@ int Place(float place, int length) {
 /// @param origin  of the frame's corner within the picture
 Span Keep(float firstCut, float lastCut, int length, int clip, int frame, int origin) {
     const auto whole = static_cast<float>(length);
-    const double scale = static_cast<double>(static_cast<float>(clip) / whole);
-    const double start = static_cast<double>(origin - (clip - frame) / 2) / length;
+    const auto scale = static_cast<double>(static_cast<float>(clip) / whole);
+    const int margin = (clip - frame) / 2;
+    const double start = static_cast<double>(origin - margin) / length;
     const double first = std::max(0.0, static_cast<double>(firstCut) * scale + start);
     const double last = std::max(0.0, 1.0 - static_cast<double>(1.0F - lastCut) * scale - start);
     return {Place(whole * static_cast<float>(first), length), Place(whole - whole * static_cast<float>(last), length)};

@@ -51,7 +51,7 @@ void RunDirectionalBlur(const EffectContext& context, LayerPicture& layer) {
     const Picture sheared =
         horizontal ? Shear(layer.picture, plan.GetShearedSize(width, height), height, true, double{plan.shear})
                    : Shear(layer.picture, width, plan.GetShearedSize(height, width), false, double{plan.shear});
-    const double sigma = double{plan.sigma};
+    const auto sigma = double{plan.sigma};
     const Picture blurred =
         horizontal ? GaussianBlur(sheared, 0, sigma, 0, padY, false) : GaussianBlur(sheared, sigma, 0, padX, 0, false);
     layer.picture = Shear(blurred, width + 2 * padX, height + 2 * padY, horizontal, -double{plan.shear});
