@@ -178,8 +178,8 @@ private:
 
 }  // namespace
 
-FilterGraph::FilterGraph(const std::string& text, int width, int height, Vellum::PixelAspectRatio aspect)
-    : mText(text) {
+FilterGraph::FilterGraph(std::string text, int width, int height, Vellum::PixelAspectRatio aspect)
+    : mText(std::move(text)) {
     CheckFilters();
     const bool direct = std::any_of(std::begin(kFormats), std::end(kFormats),
                                     [&](AVPixelFormat format) { return Build(format, false, width, height, aspect); });

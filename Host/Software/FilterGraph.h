@@ -25,7 +25,7 @@ class FilterGraph {
 public:
     /// Throws std::runtime_error for a text that is no such graph, and for filters that need other frames than the one
     /// they get, change the rate, or bring pictures of their own.
-    FilterGraph(const std::string& text, int width, int height, Vellum::PixelAspectRatio aspect);
+    FilterGraph(std::string text, int width, int height, Vellum::PixelAspectRatio aspect);
 
     /// The picture that comes out, perhaps of another size. Throws std::runtime_error.
     /// @param time  in ticks, what filters know as `t`

@@ -60,7 +60,8 @@ void ReadTransitionOpacity(const Node& transition, std::int64_t nodeTime, LayerM
     }
     if (!input || input->node->kind != NodeKind::kClip) return;
     const Node* opacity = FindOperator(*input->node, kOpacityMatchName, SIZE_MAX);
-    if (!opacity || Evaluate(*opacity, kOpacity_BlendMode, 0, {Kiln::kBlend_Normal})[0] == Kiln::kBlend_Normal) return;
+    constexpr double kNormal = Kiln::kBlend_Normal;
+    if (!opacity || Evaluate(*opacity, kOpacity_BlendMode, 0, {kNormal})[0] == kNormal) return;
     const ItemTimes times = input->node->AsItem()->time.AtItemTime(nodeTime - input->offset);
     ReadOpacity(*opacity, times.parameters, motion);
 }

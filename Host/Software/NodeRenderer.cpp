@@ -89,7 +89,7 @@ Picture NodeRenderer::RenderSequence(const Sequence& sequence, std::int64_t time
     View view = ViewOf(sequence.format, 4);
     view.fieldSelection = fieldSelection;
     const Segment* segment = sequence.plain.Find(time);
-    if (!segment) return Picture(view.width, view.height);
+    if (!segment) return {view.width, view.height};
     return RenderFrame(*segment->root, time - segment->start + segment->offset, view);
 }
 
@@ -138,7 +138,7 @@ LayerPicture NodeRenderer::RenderClip(const Node& clip, const ItemTimes& times, 
 }
 
 Picture NodeRenderer::RenderInput(const NodeInput& input, std::int64_t time, const View& view) {
-    if (!input.node) return Picture(view.width, view.height);
+    if (!input.node) return {view.width, view.height};
     return RenderFrame(*input.node, time - input.offset, view);
 }
 

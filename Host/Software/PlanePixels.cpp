@@ -34,8 +34,8 @@ Component RowOf(const AVFrame& frame, const AVPixFmtDescriptor& format, int inde
 }
 
 void WriteRow(const float* values, int count, const Component& to) {
-    for (int x = 0; x < count; ++x) {
-        std::uint8_t* target = to.row + static_cast<std::ptrdiff_t>(to.step) * x;
+    for (std::ptrdiff_t x = 0; x < count; ++x) {
+        std::uint8_t* target = to.row + to.step * x;
         const float value = values[4 * x];
         if (to.isFloat) {
             std::memcpy(target, &value, sizeof value);
@@ -53,8 +53,8 @@ void WriteRow(const float* values, int count, const Component& to) {
 }
 
 void ReadRow(const Component& from, int count, float* values) {
-    for (int x = 0; x < count; ++x) {
-        const std::uint8_t* source = from.row + static_cast<std::ptrdiff_t>(from.step) * x;
+    for (std::ptrdiff_t x = 0; x < count; ++x) {
+        const std::uint8_t* source = from.row + from.step * x;
         if (from.isFloat) {
             std::memcpy(&values[4 * x], source, sizeof(float));
         } else {

@@ -78,7 +78,7 @@ void LayOver(float* below, const Pixel& color, double coverage) {
 std::string FindFontFile(const std::string& family) {
     const std::string stem = StemOf(family);
     for (const std::string& name : {stem, std::string("LiberationSans-Regular")}) {
-        const std::string path = Tarn::FindFontFile(name + ".ttf");
+        std::string path = Tarn::FindFontFile(name + ".ttf");
         if (!path.empty()) return path;
     }
     throw MediaError("no font for text: the Liberation fonts aren't installed (Debian package fonts-liberation)");

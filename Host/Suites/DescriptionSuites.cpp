@@ -88,7 +88,8 @@ VantrelHostStatus ReleaseNode(std::uint32_t nodeID) { return Services().GetNodes
 VantrelHostStatus GetNodeInfo(std::uint32_t nodeID, char* kindText, char* hashText, std::uint32_t* flags) {
     const NodePtr node = Services().FindNode(nodeID);
     if (!node) return kFailed;
-    std::strcpy(kindText, GetKindText(node->kind));
+    const char* const kind = GetKindText(node->kind);
+    std::memcpy(kindText, kind, std::strlen(kind) + 1);
     PutGuid(node->hash, hashText);
     *flags = node->flags;
     return kOk;

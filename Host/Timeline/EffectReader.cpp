@@ -185,7 +185,8 @@ std::vector<Parameter> ReadParameters(const std::string& matchName, const std::o
         const JsonCursor at = params->Get(key);
         if (table != nullptr) {
             const Parameter* known = table->Find(key);
-            if (known == nullptr) at.Fail("\"" + matchName + "\" has no parameter \"" + key + "\"");
+            if (known == nullptr)
+                at.Fail(std::string("\"").append(matchName).append("\" has no parameter \"").append(key).append("\""));
             ParameterReader(matchName, parameters[static_cast<std::size_t>(known->index)]).Read(at);
             continue;
         }

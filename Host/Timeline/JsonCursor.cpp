@@ -76,19 +76,19 @@ void JsonCursor::Warn(const std::string& message) const {
 std::optional<JsonCursor> JsonCursor::Find(const std::string& key) const {
     const auto member = mValue->find(key);
     if (member == mValue->end() || member->is_null()) return std::nullopt;
-    return JsonCursor(*member, mPath + "/" + key, *mContext);
+    return {*member, mPath + "/" + key, *mContext};
 }
 
 JsonCursor JsonCursor::Get(const std::string& key) const {
     const auto member = mValue->find(key);
     if (member == mValue->end()) Fail("\"" + key + "\" is missing");
-    return JsonCursor(*member, mPath + "/" + key, *mContext);
+    return {*member, mPath + "/" + key, *mContext};
 }
 
 std::size_t JsonCursor::Size() const { return mValue->size(); }
 
 JsonCursor JsonCursor::Element(std::size_t index) const {
-    return JsonCursor((*mValue)[index], mPath + "/" + std::to_string(index), *mContext);
+    return {(*mValue)[index], mPath + "/" + std::to_string(index), *mContext};
 }
 
 std::vector<double> JsonCursor::Numbers(std::size_t count, std::size_t otherCount) const {

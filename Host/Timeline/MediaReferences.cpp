@@ -103,7 +103,7 @@ void ReadGenerator(const JsonCursor& at, MediaReference& reference) {
     if (parameters) parameters->ExpectObject();
     if (reference.generator == "color") {
         if (!parameters || !parameters->Find("color"))
-            at.Fail("a generator of kind \"color\" needs \"color\": [r, g, b]");
+            at.Fail(R"(a generator of kind "color" needs "color": [r, g, b])");
         const std::array<double, 4> color = ReadColor(parameters->Get("color"));
         for (std::size_t i = 0; i < 3; ++i) reference.color[i] = static_cast<std::uint8_t>(color[i] * 255.0 + 0.5);
     } else if (reference.generator == "title") {

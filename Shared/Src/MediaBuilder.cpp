@@ -39,7 +39,8 @@ bool PlaysPlainly(const VideoClipNode& clip) {
 
 /// A time of the outer sequence at a speed, rounded half up. Times that no sequence reaches stay within their type.
 std::int64_t AtSpeed(double speed, std::int64_t ticks) {
-    constexpr double kLimit = static_cast<double>(std::numeric_limits<std::int64_t>::max() / 2);
+    constexpr std::int64_t kFarthest = std::numeric_limits<std::int64_t>::max() / 2;
+    constexpr auto kLimit = static_cast<double>(kFarthest);
     return static_cast<std::int64_t>(std::clamp(speed * static_cast<double>(ticks) + 0.5, -kLimit, kLimit));
 }
 

@@ -20,7 +20,7 @@ struct SubTypeFamily {
     std::initializer_list<std::uint32_t> codes;
 };
 
-const SubTypeFamily kFamilies[] = {
+constexpr SubTypeFamily kFamilies[] = {
     {{Code("dsvn"), Code("dvc "), Code("dsv2"), Code("kl24")},
      {Code("dsvn"), Code("dvc "), Code("dsv2"), Code("kl24"), Code("dsvd")}},
     {{Code("dsvp"), Code("dvcp")}, {Code("dsvp"), Code("dvcp"), Code("dsvd")}},

@@ -36,7 +36,8 @@ void RunNoise(const EffectContext& context, LayerPicture& layer) {
     const double amount = context.Number(0) / 100.0;
     const bool inColor = context.Flag(1), clips = context.Flag(2);
     const std::int64_t ticks = context.view.frameTicks;
-    const float frame = ticks != 0 ? static_cast<float>(context.time / ticks) : 0.0F;
+    const std::int64_t number = ticks != 0 ? context.time / ticks : 0;
+    const auto frame = static_cast<float>(number);
     std::uint32_t frameBits = 0;
     std::memcpy(&frameBits, &frame, sizeof frameBits);
     ChangePixels(layer.picture, [&](Pixel p, int x, int y) {

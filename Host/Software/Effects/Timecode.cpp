@@ -93,7 +93,7 @@ void RunTimecode(const EffectContext& context, LayerPicture& layer) {
     const bool leaves =
         x < 0 || y < 0 || x + glyphs.width > layer.picture.width || y + glyphs.height > layer.picture.height;
     if (isSmaller && leaves) PutOnFrame(context.view, layer, x, y);
-    const double opacity = static_cast<double>(static_cast<float>(context.Number(kTimecode_Opacity)) / 100.0F);
+    const auto opacity = static_cast<double>(static_cast<float>(context.Number(kTimecode_Opacity)) / 100.0F);
     Blend(glyphs, x, y, std::clamp(opacity, 0.0, 1.0), layer.picture);
 }
 
