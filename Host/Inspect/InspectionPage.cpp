@@ -30,7 +30,7 @@ std::string EscapeForPage(const std::string& json) {
     text.reserve(json.size());
     for (const char c : json) {
         if (c == '<') {
-            text += "\\u003c";
+            text += R"(\u003c)";
         } else {
             text += c;
         }

@@ -76,7 +76,7 @@ void JsonCursor::Warn(const std::string& message) const {
 std::optional<JsonCursor> JsonCursor::Find(const std::string& key) const {
     const auto member = mValue->find(key);
     if (member == mValue->end() || member->is_null()) return std::nullopt;
-    return {*member, mPath + "/" + key, *mContext};
+    return JsonCursor(*member, mPath + "/" + key, *mContext);
 }
 
 JsonCursor JsonCursor::Get(const std::string& key) const {

@@ -216,7 +216,7 @@ SegmentVerdict SegmentReader::PlaceSegment(const VideoSegmentsHandle& handle, co
 
     if (const SegmentVerdict* const known = FindReusable(*mState.buildingCache, segment.guid)) {
         TraceSecondOccurrence(segment.guid);
-        const SegmentVerdict verdict = *known;
+        SegmentVerdict verdict = *known;
         TakeOverTree(verdict, info, top);
         TraceReuse(info);
         return verdict;

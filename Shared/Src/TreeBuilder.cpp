@@ -15,7 +15,7 @@ namespace {
 using Ostrand::Failed;
 using Ostrand::kStatus_OK;
 
-constexpr const char* kSourcePath = "..\\..\\..\\Shared\\Src\\Timeline";
+constexpr const char* kSourcePath = R"(..\..\..\Shared\Src\Timeline)";
 constexpr const char* kContractMessage =
     "$$$/Halden/utility/Error/Contract/InputContractViolation=An input contract violation has occurred!";
 

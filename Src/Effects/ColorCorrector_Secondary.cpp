@@ -15,7 +15,7 @@ namespace {
 static_assert(offsetof(SecondaryParameters, blurRadiusX) == 48 &&
               offsetof(SecondaryParameters, invertSelection) == 60 && offsetof(SecondaryParameters, fullCircle) == 64);
 
-constexpr const char* kModuleKey = "..\\..\\Src\\Effects\\ColorCorrector_Secondary";
+constexpr const char* kModuleKey = R"(..\..\Src\Effects\ColorCorrector_Secondary)";
 KernelTable gKernel;
 ModuleSymbol gRecord{kModuleKey, "inSecondaryParameters", {}};
 

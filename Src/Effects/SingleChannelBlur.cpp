@@ -22,7 +22,7 @@ struct BlurKernel {
     KernelTable table;
 };
 
-constexpr const char* kRecursionKey = "..\\..\\Src\\Effects\\SingleChannelBlur";
+constexpr const char* kRecursionKey = R"(..\..\Src\Effects\SingleChannelBlur)";
 constexpr const char* kColumnsKey = "SingleChannelBlur";
 BlurKernel gVertical{kRecursionKey, "VerticalRecursiveGaussianGRAYF32_kernel", {}};
 BlurKernel gHorizontal{kRecursionKey, "HorizontalRecursiveGaussianGrayF32_kernel", {}};

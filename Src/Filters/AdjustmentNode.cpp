@@ -11,7 +11,7 @@
 namespace Vantrel {
 namespace {
 
-EffectKernel gAdjustment{"..\\..\\Src\\Filters\\AdjustmentNode", "AdjustmentLayerKernel", {}};
+EffectKernel gAdjustment{R"(..\..\Src\Filters\AdjustmentNode)", "AdjustmentLayerKernel", {}};
 
 void AdjustmentLayerKernel(DeviceValue /*processed*/, std::int32_t /*processedPitch*/, DeviceValue /*matte*/,
                            std::int32_t /*mattePitch*/, DeviceValue /*out*/, std::int32_t /*outPitch*/,

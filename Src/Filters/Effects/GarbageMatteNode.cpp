@@ -10,7 +10,7 @@
 namespace Vantrel {
 namespace {
 
-constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Effects\\GarbageMatteNode";
+constexpr const char* kModuleKey = R"(..\..\Src\Filters\Effects\GarbageMatteNode)";
 ModuleSymbol gPolyPoints{kModuleKey, "polyPoints", {}};
 EffectKernel gBitmask{kModuleKey, "cuda_kernel_bitmask", {}};
 EffectKernel gInPlace4{"GarbageMatte", "amdcl_kernel_gm4_inplace", {}};

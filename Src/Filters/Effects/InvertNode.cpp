@@ -7,7 +7,7 @@
 namespace Vantrel {
 namespace {
 
-EffectKernel gInvert{"..\\..\\Src\\Filters\\Effects\\InvertNode", "InvertKernel", {}};
+EffectKernel gInvert{R"(..\..\Src\Filters\Effects\InvertNode)", "InvertKernel", {}};
 
 void InvertKernel(Vellum::PixelFormat /*format*/, DeviceValue /*out*/, std::int32_t /*width*/, std::int32_t /*height*/,
                   std::int32_t /*outPitch*/, DeviceValue /*in*/, std::int32_t /*inPitch*/, std::int32_t /*channels*/,

@@ -8,7 +8,7 @@
 namespace Vantrel {
 namespace {
 
-EffectKernel gLevels{"..\\..\\Src\\Filters\\Effects\\LevelsNode", "Levels", {}};
+EffectKernel gLevels{R"(..\..\Src\Filters\Effects\LevelsNode)", "Levels", {}};
 
 constexpr std::size_t kValues = 20;
 constexpr std::int32_t kValuesOfGroup = 5;

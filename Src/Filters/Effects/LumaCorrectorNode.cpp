@@ -7,7 +7,7 @@
 namespace Vantrel {
 namespace {
 
-CorrectorKernels gKernels("..\\..\\Src\\Filters\\Effects\\LumaCorrectorNode",
+CorrectorKernels gKernels(R"(..\..\Src\Filters\Effects\LumaCorrectorNode)",
                           {"LumaCorrector_CompositeKernel", "LumaCorrector_LumaKernel",
                            "LumaCorrector_TonalRangeKernel", "LumaCorrector_MaskKernel"});
 

@@ -9,7 +9,7 @@
 namespace Vantrel {
 namespace {
 
-constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Effects\\LumaCurveNode";
+constexpr const char* kModuleKey = R"(..\..\Src\Filters\Effects\LumaCurveNode)";
 EffectKernel gComposite{kModuleKey, "LumaCurve_CompositeKernel", {}};
 EffectKernel gLuma{kModuleKey, "LumaCurve_LumaKernel", {}};
 EffectKernel gMask{kModuleKey, "LumaCurve_MaskKernel", {}};

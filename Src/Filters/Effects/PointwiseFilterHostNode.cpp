@@ -13,7 +13,7 @@
 namespace Vantrel {
 namespace {
 
-constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Effects\\PointwiseFilterHostNode";
+constexpr const char* kModuleKey = R"(..\..\Src\Filters\Effects\PointwiseFilterHostNode)";
 /// By the length of the chain, less 1.
 EffectKernel gKernels[] = {{kModuleKey, "PointwiseFilterHostKernel1", {}},
                            {kModuleKey, "PointwiseFilterHostKernel2", {}},

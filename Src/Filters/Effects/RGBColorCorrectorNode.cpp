@@ -7,7 +7,7 @@
 namespace Vantrel {
 namespace {
 
-CorrectorKernels gKernels("..\\..\\Src\\Filters\\Effects\\RGBColorCorrectorNode",
+CorrectorKernels gKernels(R"(..\..\Src\Filters\Effects\RGBColorCorrectorNode)",
                           {"RGBColorCorrector_CompositeKernel", "RGBColorCorrector_LumaKernel",
                            "RGBColorCorrector_TonalRangeKernel", "RGBColorCorrector_MaskKernel"});
 

@@ -11,7 +11,7 @@
 namespace Vantrel {
 namespace {
 
-constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Effects\\RGBCurvesNode";
+constexpr const char* kModuleKey = R"(..\..\Src\Filters\Effects\RGBCurvesNode)";
 EffectKernel gComposite{kModuleKey, "RGBCurves_CompositeKernel", {}};
 EffectKernel gLuma{kModuleKey, "RGBCurves_LumaKernel", {}};
 EffectKernel gMask{kModuleKey, "RGBCurves_MaskKernel", {}};

@@ -10,7 +10,7 @@
 namespace Vantrel {
 namespace {
 
-CorrectorKernels gKernels("..\\..\\Src\\Filters\\Effects\\ThreeWayColorCorrectorNode",
+CorrectorKernels gKernels(R"(..\..\Src\Filters\Effects\ThreeWayColorCorrectorNode)",
                           {"ThreeWayColorCorrector_CompositeKernel", "ThreeWayColorCorrector_LumaKernel",
                            "ThreeWayColorCorrector_TonalRangeKernel", "ThreeWayColorCorrector_MaskKernel"});
 

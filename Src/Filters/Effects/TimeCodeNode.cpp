@@ -17,7 +17,7 @@ namespace {
 constexpr std::int32_t kGlyphBytes = 4;
 constexpr std::int32_t kSource_Media = 1;
 
-EffectKernel gTimecode{"..\\..\\Src\\Filters\\Effects\\TimeCodeNode", "cuda_kernel_timecode", {}};
+EffectKernel gTimecode{R"(..\..\Src\Filters\Effects\TimeCodeNode)", "cuda_kernel_timecode", {}};
 
 void TimecodeKernel(DeviceValue /*glyphs*/, std::int32_t /*skipX*/, std::int32_t /*skipY*/, DeviceValue /*frame*/,
                     std::int32_t /*width*/, std::int32_t /*height*/, std::int32_t /*x*/, std::int32_t /*y*/,

@@ -18,7 +18,7 @@ namespace {
 constexpr const char16_t* kMotion = u"TQ.XQVE Motion";
 constexpr const char16_t* kOpacity = u"TQ.XQVE Opacity";
 
-EffectKernel gTrackMatte{"..\\..\\Src\\Filters\\Effects\\TrackMatteNode", "TrackMatteKernel", {}};
+EffectKernel gTrackMatte{R"(..\..\Src\Filters\Effects\TrackMatteNode)", "TrackMatteKernel", {}};
 
 void TrackMatteKernel(DeviceValue /*frame*/, std::int32_t /*pitch*/, std::int32_t /*width*/, std::int32_t /*height*/,
                       DeviceValue /*matte*/, std::int32_t /*mattePitch*/, std::int32_t /*matteWidth*/,

@@ -11,7 +11,7 @@
 namespace Vantrel {
 namespace {
 
-constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Effects\\UltraKeyNode";
+constexpr const char* kModuleKey = R"(..\..\Src\Filters\Effects\UltraKeyNode)";
 ModuleSymbol gRecord{kModuleKey, "inParams", {}};
 EffectKernel gComposite{kModuleKey, "cuda_kernel_composite", {}};
 EffectKernel gChokeX{kModuleKey, "cuda_kernel_chokefilter_x", {}};

@@ -8,7 +8,7 @@
 namespace Vantrel {
 namespace {
 
-EffectKernel gLimiter{"..\\..\\Src\\Filters\\Effects\\VideoLimiterNode", "VideoLimiter", {}};
+EffectKernel gLimiter{R"(..\..\Src\Filters\Effects\VideoLimiterNode)", "VideoLimiter", {}};
 
 }  // namespace
 

@@ -8,7 +8,7 @@
 namespace Vantrel {
 namespace {
 
-EffectKernel gInvertAlpha{"..\\..\\Src\\Filters\\Source\\InvertAlphaSource", "InvertAlphaKernel", {}};
+EffectKernel gInvertAlpha{R"(..\..\Src\Filters\Source\InvertAlphaSource)", "InvertAlphaKernel", {}};
 
 void InvertAlphaKernel(DeviceValue /*frame*/, std::int32_t /*pitch*/, Vellum::PixelFormat /*format*/,
                        std::int32_t /*width*/, std::int32_t /*height*/) {}

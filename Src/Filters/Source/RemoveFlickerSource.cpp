@@ -10,7 +10,7 @@
 namespace Vantrel {
 namespace {
 
-constexpr const char* kModule = "..\\..\\Src\\Filters\\Source\\RemoveFlickerSource";
+constexpr const char* kModule = R"(..\..\Src\Filters\Source\RemoveFlickerSource)";
 
 EffectKernel gRemoveFlicker{kModule, "RemoveFlickerKernel", {}};
 TextureTable gSourceTexture;

@@ -12,7 +12,7 @@
 namespace Vantrel {
 namespace {
 
-constexpr const char* kModuleKey = "..\\..\\Src\\Filters\\Synthetics\\ColorBarsNode";
+constexpr const char* kModuleKey = R"(..\..\Src\Filters\Synthetics\ColorBarsNode)";
 EffectKernel gCudaBars{kModuleKey, "ColorBarsKernelCuda", {}};
 EffectKernel gOpenCLBars{kModuleKey, "ColorBarsKernelOpenCL", {}};
 

@@ -9,7 +9,7 @@
 namespace Vantrel {
 namespace {
 
-EffectKernel gAdditiveDissolve{"..\\..\\Src\\Filters\\Transitions\\AdditiveDissolveNode", "AdditiveDissolveKernel", {}};
+EffectKernel gAdditiveDissolve{R"(..\..\Src\Filters\Transitions\AdditiveDissolveNode)", "AdditiveDissolveKernel", {}};
 
 void AdditiveDissolveKernel(DeviceValue /*in*/, std::int32_t /*inPitch*/, DeviceValue /*in2*/,
                             std::int32_t /*in2Pitch*/, DeviceValue /*out*/, std::int32_t /*outPitch*/,
