@@ -33,7 +33,12 @@ std::int32_t EndOfKept(std::int32_t length, float cut) {
 struct ClipAxis {
     ClipAxis(std::int32_t clipLength, std::int32_t outputLength, std::int32_t frameLength, std::int32_t origin)
         : scale(static_cast<double>(static_cast<float>(clipLength) / static_cast<float>(frameLength))),
-          start(static_cast<double>(origin - (clipLength - outputLength) / 2) / frameLength) {}
+          start(StartOf(origin - (clipLength - outputLength) / 2, frameLength)) {}
+
+    /// A place in pixels as a share of the frame.
+    [[nodiscard]] static double StartOf(std::int32_t place, std::int32_t frameLength) {
+        return static_cast<double>(place) / frameLength;
+    }
 
     [[nodiscard]] float FirstCut(float cut) const {
         return static_cast<float>(std::max(0.0, static_cast<double>(cut) * scale + start));
