@@ -57,7 +57,7 @@ private:
 /// The four kernels of a corrector with tonal ranges, by output.
 class CorrectorKernels {
 public:
-    CorrectorKernels(const char* moduleKey, const std::array<const char*, kCorrectorOutput_Count>& names)
+    CorrectorKernels(const char* moduleKey, const std::array<const char*, kCorrectorOutput_Count>& names) noexcept
         : mKernels{{{moduleKey, names[0], {}},
                     {moduleKey, names[1], {}},
                     {moduleKey, names[2], {}},
