@@ -128,7 +128,8 @@ void Noise(const Reader& read, std::int64_t frameTicks, Record& record) {
     record.r1 = read.Number(0);
     record.r2 = read.Number(1);
     record.r3 = read.Number(2);
-    record.r4 = frameTicks != 0 ? static_cast<float>(read.GetTime() / frameTicks) : 0.0F;
+    const std::int64_t number = frameTicks != 0 ? read.GetTime() / frameTicks : 0;
+    record.r4 = static_cast<float>(number);
 }
 
 void ProcAmp(const Reader& read, std::int64_t /*frameTicks*/, Record& record) {

@@ -22,7 +22,7 @@ Status RGBColorCorrectorNode::Render(const RenderToken& /*token*/, const RenderP
         read.Numbers(6, values, 0, 4);
         // A tonal range's triple for all channels, then those of red, green and blue.
         for (std::int32_t set = 0; set < 4; ++set) {
-            const auto at = static_cast<std::size_t>(4 + set * 12);
+            const std::size_t at = 4 + 12 * static_cast<std::size_t>(set);
             read.Numbers(13 + set * 3, values, at, 3);
             read.Numbers(26 + set * 9, values, at + 3, 9);
         }
