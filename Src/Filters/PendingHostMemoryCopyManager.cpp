@@ -4,13 +4,11 @@
 
 #include <algorithm>
 
-#include <boost/bind/bind.hpp>
-
 namespace Vantrel {
 
 namespace {
 
-PendingHostMemoryCopyManager gInstance;
+PendingHostMemoryCopyManager gInstance;  // NOLINT(cert-err58-cpp): without its lock the library can't be loaded
 
 }  // namespace
 
@@ -58,7 +56,7 @@ void PendingHostMemoryCopyManager::QueueCopy(const boost::shared_ptr<Halden::thr
         Ostrand::ScopedLock lock(mQueueLock, "PendingHostMemoryCopyManager::QueueCopy");
         mQueue.emplace_back(hash, std::move(copy));
     }
-    executor->Post(boost::bind(&PendingHostMemoryCopyManager::ExecuteThreadCopy, this), 0);
+    executor->Post([this] { ExecuteThreadCopy(); }, 0);
 }
 
 void PendingHostMemoryCopyManager::Complete(const Kiln::DeviceRef& device, const Guid& hash,

@@ -14,9 +14,11 @@ namespace Vantrel {
 ///
 /// Written by LoadCudaDriver in one thread under the lock of Initialize, read without a lock after that.
 struct CudaDriverTable {
+// NOLINTBEGIN(bugprone-macro-parentheses): names that are declared can't stand in parentheses
 #define CUDA_PROBE(name) decltype(&::name) name = nullptr;
 #define CUDA_ENTRY(driver, name) decltype(&::name) name = nullptr;
 #define CUDA_VERSIONED(driver, name) decltype(&::name) name = nullptr;
+// NOLINTEND(bugprone-macro-parentheses)
 #define CUDA_REBIND(driver, requested, name, symbol)
 #include "Src/Kernels/CudaDriverEntries.h"
 };

@@ -16,7 +16,7 @@ FilterNodeRef FindFilterInput(const FilterNodeRef& node, std::size_t index) {
 /// The opacity on the side of a transition that shows something, unless it has a blend mode.
 FilterNodeRef FindOpacityBelow(const FilterNodeRef& first, const FilterNodeRef& second, const WideString& name) {
     const bool firstShows = first && first->GetName() != u"BlackVideoSource";
-    const FilterNodeRef found = FindEffectNode(firstShows ? first : second, name);
+    FilterNodeRef found = FindEffectNode(firstShows ? first : second, name);
     if (!found || !found->GetDescription()) return found;
     const std::int32_t mode = found->GetDescription()->GetIntParam(kOpacityParam_BlendMode, 0);
     return mode == Kiln::kBlend_Normal ? FilterNodeRef() : found;

@@ -70,7 +70,7 @@ double VideoNode::GetDoubleParam(std::int32_t index, std::int64_t ticks) const {
 
 void VideoNode::GetColorParam(std::int32_t index, std::int64_t ticks, float& first, float& second, float& third,
                               float& fourth) const {
-    const std::uint64_t words = ReadParam<std::uint64_t>(index, ticks);
+    const auto words = ReadParam<std::uint64_t>(index, ticks);
     const auto word = [words](int place) {
         return static_cast<float>(static_cast<std::uint16_t>(words >> (16 * place))) / kColorParamOne;
     };
@@ -85,7 +85,7 @@ void VideoNode::GetPointParam(std::int32_t index, std::int64_t ticks, double& x,
         double x;
         double y;
     };
-    const Point point = ReadParam<Point>(index, ticks);
+    const auto point = ReadParam<Point>(index, ticks);
     x = point.x;
     y = point.y;
 }

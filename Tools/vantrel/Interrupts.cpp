@@ -18,8 +18,8 @@ InterruptScope::InterruptScope()
     : mOldInterrupt(std::signal(SIGINT, OnInterrupt)), mOldTerminate(std::signal(SIGTERM, OnInterrupt)) {}
 
 InterruptScope::~InterruptScope() {
-    std::signal(SIGINT, mOldInterrupt);
-    std::signal(SIGTERM, mOldTerminate);
+    (void)std::signal(SIGINT, mOldInterrupt);
+    (void)std::signal(SIGTERM, mOldTerminate);
 }
 
 const std::atomic<bool>& InterruptScope::GetStop() const { return gStop; }

@@ -32,21 +32,22 @@ void Progress::Advance(std::int64_t done) {
     const double rate = static_cast<double>(done) / seconds;
     const double left = rate > 0 ? static_cast<double>(mFrames - done) / rate : 0;
     if (mForm == Form::kJson) {
-        std::fprintf(stderr, "{\"frame\": %lld, \"frames\": %lld, \"fps\": %.2f, \"secondsLeft\": %.1f}\n",
-                     static_cast<long long>(done), static_cast<long long>(mFrames), rate, left);
+        (void)std::fprintf(stderr, "{\"frame\": %lld, \"frames\": %lld, \"fps\": %.2f, \"secondsLeft\": %.1f}\n",
+                           static_cast<long long>(done), static_cast<long long>(mFrames), rate, left);
         return;
     }
     const auto filled = static_cast<int>(kBarWidth * done / mFrames);
     const std::string bar = std::string(static_cast<std::size_t>(filled), '#') +
                             std::string(static_cast<std::size_t>(kBarWidth - filled), '.');
     const auto wholeLeft = static_cast<long>(std::lround(left));
-    std::fprintf(stderr, "\r[%s] %lld of %lld frames, %.1f fps, %ld:%02ld left \033[K", bar.c_str(),
-                 static_cast<long long>(done), static_cast<long long>(mFrames), rate, wholeLeft / 60, wholeLeft % 60);
-    std::fflush(stderr);
+    (void)std::fprintf(stderr, "\r[%s] %lld of %lld frames, %.1f fps, %ld:%02ld left \033[K", bar.c_str(),
+                       static_cast<long long>(done), static_cast<long long>(mFrames), rate, wholeLeft / 60,
+                       wholeLeft % 60);
+    (void)std::fflush(stderr);
 }
 
 void Progress::End() {
-    if (mForm == Form::kBar) std::fprintf(stderr, "\r\033[K");
+    if (mForm == Form::kBar) (void)std::fprintf(stderr, "\r\033[K");
 }
 
 }  // namespace Vantrel::Tool

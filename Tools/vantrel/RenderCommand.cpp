@@ -67,33 +67,35 @@ double Percent(std::int64_t part, std::int64_t whole) {
 
 void PrintSummary(const RenderSession& session, const RenderSummary& summary, const std::string& output) {
     const double rate = summary.seconds > 0 ? static_cast<double>(summary.frames) / summary.seconds : 0;
-    std::fprintf(stderr, "%s: %lld frames in %.2f s, %.1f fps, waited %.1f%% for media\n", output.c_str(),
-                 static_cast<long long>(summary.frames), summary.seconds, rate,
-                 summary.seconds > 0 ? 100.0 * summary.waitSeconds / summary.seconds : 0.0);
-    std::fprintf(stderr,
-                 "on %s: %.1f%% of frames on the device, %.1f%% partly the host's, %.1f%% the host's; peak device "
-                 "memory %.1f MB\n",
-                 session.GetDevice()->GetName().c_str(), Percent(summary.deviceFrames, summary.frames),
-                 Percent(summary.partlyHostFrames, summary.frames), Percent(summary.hostFrames, summary.frames),
-                 static_cast<double>(summary.peakDeviceBytes) / (1 << 20));
+    (void)std::fprintf(stderr, "%s: %lld frames in %.2f s, %.1f fps, waited %.1f%% for media\n", output.c_str(),
+                       static_cast<long long>(summary.frames), summary.seconds, rate,
+                       summary.seconds > 0 ? 100.0 * summary.waitSeconds / summary.seconds : 0.0);
+    (void)std::fprintf(
+        stderr,
+        "on %s: %.1f%% of frames on the device, %.1f%% partly the host's, %.1f%% the host's; peak device "
+        "memory %.1f MB\n",
+        session.GetDevice()->GetName().c_str(), Percent(summary.deviceFrames, summary.frames),
+        Percent(summary.partlyHostFrames, summary.frames), Percent(summary.hostFrames, summary.frames),
+        static_cast<double>(summary.peakDeviceBytes) / (1 << 20));
     if (summary.failedFrames > 0) {
-        std::fprintf(stderr, "warning: the device gave up %lld frames, which the host rendered\n",
-                     static_cast<long long>(summary.failedFrames));
+        (void)std::fprintf(stderr, "warning: the device gave up %lld frames, which the host rendered\n",
+                           static_cast<long long>(summary.failedFrames));
     }
-    for (const std::string& text : session.GetOffline()) std::fprintf(stderr, "offline: %s\n", text.c_str());
+    for (const std::string& text : session.GetOffline()) (void)std::fprintf(stderr, "offline: %s\n", text.c_str());
     for (const std::string& name : session.GetPassedThrough()) {
-        std::fprintf(stderr, "passed through: effect \"%s\" is known neither to the device nor to the host\n",
-                     name.c_str());
+        (void)std::fprintf(stderr, "passed through: effect \"%s\" is known neither to the device nor to the host\n",
+                           name.c_str());
     }
     for (const std::string& text : session.GetService().GetFailures())
-        std::fprintf(stderr, "failed: %s\n", text.c_str());
+        (void)std::fprintf(stderr, "failed: %s\n", text.c_str());
 }
 
 int Render(const RenderArguments& arguments) {
     RenderSession session(MakeRenderOptions(arguments));
     for (const std::string& warning : session.GetSnapshot().warnings) std::cerr << "warning: " << warning << "\n";
     const Host::SequenceFormat& sequence = session.GetSequence().format;
-    const auto [first, end] = ParseRange(arguments, session.GetFrameCount());
+    const auto range = ParseRange(arguments, session.GetFrameCount());
+    const std::int64_t first = range.first, end = range.second;
     if (end <= first) throw UsageError(arguments.session.file + ": the sequence is empty");
     const auto [width, height] = ParseSize(arguments.size, sequence);
 

@@ -45,7 +45,7 @@ Status PointwiseFilterHostNode::Render(const RenderToken& token, const RenderPar
     FilterList list;
     bool needsNewFrame = false;
     CollectPointwiseFilters(params, this, list, needsNewFrame);
-    // The nearer base's would come back here. NOLINTNEXTLINE(bugprone-parent-virtual-call)
+    // The nearer base's would come back here.
     Status status = RenderNodeBase::RenderFrame(token, params, results, mFrameSlot);
     if (Ostrand::Failed(status)) return status;
     const VideoFrameRef input = mFrameSlot;

@@ -56,7 +56,7 @@ Status TrackMatteNode::QueryInterface(const Guid& iid, void** out) {
 RenderNodeRef TrackMatteNode::FindTrackInput(const RenderToken& token, std::int32_t track) {
     const auto above = Ostrand::Query<RenderNodeBase>(token);
     for (std::size_t i = 0; above && i < above->GetInputCount(); ++i) {
-        const RenderNodeRef layer = above->GetInput(i);
+        RenderNodeRef layer = above->GetInput(i);
         if (layer && TrackOf(layer) == track) return layer;
     }
     return {};
