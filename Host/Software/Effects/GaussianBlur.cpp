@@ -5,6 +5,7 @@
 #include <algorithm>
 
 #include "Vantrel/Effects/GaussianBlur.h"
+#include "Vantrel/Effects/GrownPicture.h"
 
 namespace Vantrel::Host::Software {
 namespace {
@@ -48,9 +49,7 @@ double SigmaOf(const EffectContext& context, double pixelSize) {
 
 int PadOf(double sigma, bool keepSize) {
     // The reach in single precision, as the engine counts it.
-    return sigma > 0.0 && !keepSize
-               ? static_cast<int>(std::ceil(static_cast<double>(static_cast<float>(sigma)) * 3.5)) + 3
-               : 0;
+    return sigma > 0.0 && !keepSize ? PixelsToGrow(static_cast<double>(static_cast<float>(sigma)) * 3.5) + 3 : 0;
 }
 
 }  // namespace

@@ -5,6 +5,7 @@
 #include <cmath>
 
 #include "Vantrel/Effects/EffectRow.h"
+#include "Vantrel/Effects/GrownPicture.h"
 
 namespace Vantrel {
 
@@ -37,15 +38,8 @@ struct ShearPlan {
     [[nodiscard]] std::int32_t GetShearedSize(std::int32_t along, std::int32_t across) const {
         return static_cast<std::int32_t>(std::fabs(shear) * static_cast<float>(across) + static_cast<float>(along));
     }
-    [[nodiscard]] std::int32_t GetPadX() const { return ToPixels(padX); }
-    [[nodiscard]] std::int32_t GetPadY() const { return ToPixels(padY); }
-
-private:
-    /// Upwards; what no frame could hold stays a number.
-    [[nodiscard]] static std::int32_t ToPixels(float reach) {
-        constexpr float kMost = 1 << 20;
-        return static_cast<std::int32_t>(std::ceil(std::fmin(std::fmax(reach, 0.0F), kMost)));
-    }
+    [[nodiscard]] std::int32_t GetPadX() const { return PixelsToGrow(padX); }
+    [[nodiscard]] std::int32_t GetPadY() const { return PixelsToGrow(padY); }
 };
 
 /// @param direction     degrees; no number counts as 0

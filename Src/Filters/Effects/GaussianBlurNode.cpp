@@ -2,13 +2,12 @@
 // SPDX-License-Identifier: Apache-2.0
 #include "Src/Filters/Effects/GaussianBlurNode.h"
 
-#include <cmath>
-
 #include "Kiln/FrameOperations.h"
 #include "Kiln/Frames.h"
 #include "Src/Filters/Effects/GrownFrame.h"
 #include "Src/Filters/Effects/OneKernelEffect.h"
 #include "Vantrel/Effects/GaussianBlur.h"
+#include "Vantrel/Effects/GrownPicture.h"
 
 namespace Vantrel {
 namespace {
@@ -52,7 +51,7 @@ struct Blur {
     [[nodiscard]] std::int32_t Pad(float sigma, std::int32_t direction) const {
         constexpr std::int32_t kMargin = 3;
         if ((Direction() & direction) == 0 || !(sigma > 0.0F) || keepSize) return 0;
-        return static_cast<std::int32_t>(std::ceil(static_cast<double>(sigma) * kReach)) + kMargin;
+        return PixelsToGrow(static_cast<double>(sigma) * kReach) + kMargin;
     }
 };
 
