@@ -76,12 +76,16 @@ function(_device_module_cpu source output)
 endfunction()
 
 # Directives are carried out and macros kept, so that the text stays legible and the platform's own macros decide. The
-# lanes are set by whoever builds the program. Headers are followed through the CPU object's dependencies.
+# lanes are set by whoever builds the program. Headers are followed through the CPU object's dependencies, which know
+# nothing of the other targets' dialects.
+set(_device_dialects ${PROJECT_SOURCE_DIR}/Foundation/Kiln/Device/DialectOpenCL.h
+    ${PROJECT_SOURCE_DIR}/Foundation/Kiln/Device/DialectCuda.h
+    ${PROJECT_SOURCE_DIR}/Foundation/Kiln/Device/ThreadPixels.h)
 function(_device_module_opencl source output)
     add_custom_command(OUTPUT ${output}.cl
         COMMAND ${CMAKE_COMMAND} -DCOMPILER=${CMAKE_CXX_COMPILER} -DSOURCE=${source} -DOUTPUT=${output}.cl
             -DROOT=${PROJECT_SOURCE_DIR} -P ${_device_modules_dir}/DeviceModuleOpenCL.cmake
-        DEPENDS ${source} ${output}.v2.o ${_device_modules_dir}/DeviceModuleOpenCL.cmake
+        DEPENDS ${source} ${output}.v2.o ${_device_dialects} ${_device_modules_dir}/DeviceModuleOpenCL.cmake
         COMMENT "" VERBATIM)
 endfunction()
 
@@ -90,14 +94,14 @@ function(_device_module_cuda source output)
     if(_device_cuda STREQUAL "nvcc")
         add_custom_command(OUTPUT ${output}.cuda
             COMMAND ${VANTREL_NVCC} ${_device_nvcc_flags} ${includes} -x cu -fatbin ${source} -o ${output}.cuda
-            DEPENDS ${source} ${output}.v2.o COMMENT "Device module ${source} for CUDA" VERBATIM)
+            DEPENDS ${source} ${output}.v2.o ${_device_dialects} COMMENT "Device module ${source} for CUDA" VERBATIM)
     else()
         # A driver takes PTX as text with a zero behind it, which the embedding adds.
         add_custom_command(OUTPUT ${output}.cuda
             COMMAND ${VANTREL_CUDA_CLANG} -x cuda -std=c++17 -O3 -ffp-contract=fast --cuda-device-only -nocudainc
                 -nocudalib --cuda-gpu-arch=sm_75 -Wno-unknown-cuda-version -Wno-unused-command-line-argument ${includes}
                 -S ${source} -o ${output}.cuda
-            DEPENDS ${source} ${output}.v2.o COMMENT "Device module ${source} for CUDA" VERBATIM)
+            DEPENDS ${source} ${output}.v2.o ${_device_dialects} COMMENT "Device module ${source} for CUDA" VERBATIM)
     endif()
 endfunction()
 
