@@ -63,9 +63,16 @@ public:
         for (;;) {
             mWake.wait(lock, [this] { return mClosed || !mQueue.empty(); });
             if (mQueue.empty()) break;
+            ++mBusyThreads;
             RunFirstOf(mQueue, lock);
+            if (--mBusyThreads == 0 && mQueue.empty()) mIdle.notify_all();
         }
         --mThreadsInside;
+    }
+
+    void WaitUntilIdle() {
+        std::unique_lock<std::mutex> lock(mMutex);
+        mIdle.wait(lock, [this] { return mBusyThreads == 0 && mQueue.empty(); });
     }
 
     [[nodiscard]] bool HasEnded() const {
@@ -76,8 +83,10 @@ public:
 private:
     mutable std::mutex mMutex;
     std::condition_variable mWake;
+    std::condition_variable mIdle;
     std::deque<Work> mQueue;
     std::size_t mThreadsInside;
+    std::size_t mBusyThreads = 0;
     bool mClosed = false;
 };
 
@@ -235,5 +244,7 @@ boost::shared_ptr<AsyncExecutor> CreateThreadExecutor(const std::string& threadN
 }
 
 boost::shared_ptr<AsyncExecutor> CreateCPUBoundExecutor() { return boost::make_shared<CPUBoundExecutor>(); }
+
+void DrainCPUBoundExecutors() { ThreadKeeper::Instance().GetSharedLoop()->WaitUntilIdle(); }
 
 }  // namespace Halden::threads

@@ -31,4 +31,7 @@ public:
 /// that every node of a long timeline can own one.
 [[nodiscard]] boost::shared_ptr<AsyncExecutor> CreateCPUBoundExecutor();
 
+/// Returns when no executor of the pool has work left, what that work held included. Not from within such work.
+void DrainCPUBoundExecutors();
+
 }  // namespace Halden::threads

@@ -93,7 +93,7 @@ private:
 };
 
 /// Finds the devices. Calls nest; the argument is reserved, pass true. What a framework lacks is not an error: it then
-/// has no device, and GetFrameworkMessage tells why.
+/// has no device, and GetFrameworkMessage tells why. The last Terminate waits until processor-bound work has ended.
 ///
 /// Environment: KILN_CUDA_DRIVER (a path, "soft" or "none") and KILN_OPENCL ("none", or part of a platform's name)
 /// override what is looked for.

@@ -7,6 +7,7 @@
 
 #include <boost/make_shared.hpp>
 
+#include "Halden/Executor.h"
 #include "Kiln/Cuda/Backend.h"
 #include "Kiln/DeviceObject.h"
 #include "Kiln/Log.h"
@@ -75,6 +76,8 @@ void Terminate() {
         if (state.initializations == 0 || --state.initializations > 0) return;
         std::swap(closing, state.frameworks);
     }
+    // Copies that have told their end may still hold frames, and the nodes that asked for them.
+    Halden::threads::DrainCPUBoundExecutors();
     for (const Framework& framework : closing) {
         for (const auto& device : framework.devices) device->CloseCaches();
     }

@@ -29,7 +29,21 @@ Vellum::PixelAspectRatio ScaleAspect(Vellum::PixelAspectRatio aspect, const Vell
 
 }  // namespace
 
-/// A frame on its way: everything that the engine was given for it, and the sign that it is ready to render.
+/// The sign that a frame is ready to render. The engine's threads hold it and nothing else of the frame's, so that no
+/// tree ends on one of them, within whatever lock the engine holds while it tells.
+struct FrameLoop::Readiness {
+    std::mutex mutex;
+    std::condition_variable changed;
+    bool prepared = false;
+
+    void Set() {
+        const std::lock_guard<std::mutex> hold(mutex);
+        prepared = true;
+        changed.notify_all();
+    }
+};
+
+/// A frame on its way: everything that the engine was given for it.
 ///
 /// The engine's preparation takes only pictures that are there, so a frame goes through two sets of results: the first
 /// gathers the host's pictures, and when the last one has come the second takes them over and is staged.
@@ -40,16 +54,7 @@ struct FrameLoop::Request {
     RenderResultsRef gathered;
     RenderResultsRef results;  ///< what the frame is rendered with; settled once it is prepared
     bool refused = false;      ///< the host refused a picture: nothing will complete
-
-    std::mutex mutex;
-    std::condition_variable changed;
-    bool prepared = false;
-
-    void SetPrepared() {
-        const std::lock_guard<std::mutex> hold(mutex);
-        prepared = true;
-        changed.notify_all();
-    }
+    std::shared_ptr<Readiness> readiness = std::make_shared<Readiness>();
 };
 
 FrameLoop::FrameLoop(boost::shared_ptr<RenderSystem> system, std::shared_ptr<PixelBufferPool> pool,
@@ -97,7 +102,7 @@ void FrameLoop::Prepare(const RenderJob& job, std::int64_t number) {
     mAhead.push_back(request);
     const RenderNodeRef& root = request->info.tree;
     if (!root) {
-        request->prepared = true;
+        request->readiness->Set();
         return;
     }
     if (root->CollectHostFrames(*request->params, request->gathered, mPrevious) != 0 &&
@@ -110,10 +115,7 @@ void FrameLoop::Prepare(const RenderJob& job, std::int64_t number) {
 }
 
 void FrameLoop::Stage(RenderSystem& system, const std::shared_ptr<Request>& request) {
-    const std::weak_ptr<Request> weak = request;
-    const auto results = boost::make_shared<RenderResults>([weak] {
-        if (const std::shared_ptr<Request> complete = weak.lock()) complete->SetPrepared();
-    });
+    const auto results = boost::make_shared<RenderResults>([readiness = request->readiness] { readiness->Set(); });
     try {
         const bool complete = !request->gathered->HasFailed() &&
                               request->info.tree->CollectHostFrames(*request->params, results, request->gathered) == 0;
@@ -126,14 +128,15 @@ void FrameLoop::Stage(RenderSystem& system, const std::shared_ptr<Request>& requ
         // What keeps the pictures from being handed over will show in the render.
     }
     // With a picture missing the frame is rendered as far as it goes, and nothing is copied ahead.
-    request->SetPrepared();
+    request->readiness->Set();
 }
 
 void FrameLoop::WaitUntilPrepared(Request& request, RenderSummary& summary) {
-    std::unique_lock<std::mutex> lock(request.mutex);
-    if (request.prepared || request.refused) return;
+    Readiness& readiness = *request.readiness;
+    std::unique_lock<std::mutex> lock(readiness.mutex);
+    if (readiness.prepared || request.refused) return;
     const Clock::time_point start = Clock::now();
-    request.changed.wait(lock, [&request] { return request.prepared; });
+    readiness.changed.wait(lock, [&readiness] { return readiness.prepared; });
     summary.waitSeconds += SecondsSince(start);
 }
 

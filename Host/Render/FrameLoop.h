@@ -69,6 +69,7 @@ public:
     RenderSummary Run(const RenderJob& job, const Sink& sink, const std::atomic<bool>& stop);
 
 private:
+    struct Readiness;
     struct Request;
 
     void Prepare(const RenderJob& job, std::int64_t number);

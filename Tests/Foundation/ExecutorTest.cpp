@@ -94,3 +94,25 @@ TEST_P(EveryExecutor, EndsTheProcessWhenWorkThrows) {
 
 INSTANTIATE_TEST_SUITE_P(, EveryExecutor, testing::Values(&ThreadKind, &Halden::threads::CreateCPUBoundExecutor),
                          [](const auto& kind) { return kind.index == 0 ? "OwnThread" : "SharedPool"; });
+
+TEST(CPUBoundExecutors, AreDrainedTogetherWithWhatTheirWorkHolds) {
+    Door door;
+    int ended = 0;  // without a lock: a sanitizer would tell
+    const auto end = [&ended](int* number) {
+        std::this_thread::sleep_for(std::chrono::milliseconds(20));
+        ended += *number;
+        delete number;
+    };
+    ExecutorRef first = Halden::threads::CreateCPUBoundExecutor();
+    const ExecutorRef second = Halden::threads::CreateCPUBoundExecutor();
+    first->Post(
+        [&door, second, held = std::shared_ptr<int>(new int(1), end)]() mutable {
+            door.Wait();
+            second->Post([held = std::move(held)] {}, 0);
+        },
+        0);
+    first.reset();
+    door.Open();
+    Halden::threads::DrainCPUBoundExecutors();
+    EXPECT_EQ(ended, 1);
+}
