@@ -80,6 +80,7 @@ endfunction()
 # nothing of the other targets' dialects.
 set(_device_dialects ${PROJECT_SOURCE_DIR}/Foundation/Kiln/Device/DialectOpenCL.h
     ${PROJECT_SOURCE_DIR}/Foundation/Kiln/Device/DialectCuda.h
+    ${PROJECT_SOURCE_DIR}/Foundation/Kiln/Device/LanePixels.h
     ${PROJECT_SOURCE_DIR}/Foundation/Kiln/Device/ThreadPixels.h)
 function(_device_module_opencl source output)
     add_custom_command(OUTPUT ${output}.cl

@@ -10,7 +10,8 @@
 #define LANES OPENCL_LANES
 
 #define GLOBAL __global
-#define DEVICE_FUNCTION static inline
+// A loop with a call in it, of a function too long to be inlined by itself, becomes no vector code.
+#define DEVICE_FUNCTION static inline __attribute__((always_inline))
 #define CONSTANT_TABLE __constant
 
 typedef float4 Float4;
@@ -53,4 +54,4 @@ DEVICE_FUNCTION void StorePixel(TargetFrame frame, int format, int index, Float4
         ((__global float4*)frame)[index] = value;
 }
 
-#include "Kiln/Device/ThreadPixels.h"
+#include "Kiln/Device/LanePixels.h"

@@ -6,14 +6,22 @@
 /// columns): one on a GPU, several on a CPU, held in small private arrays and worked on by loops over EACH_LANE, which
 /// the compiler turns into vector code. Lanes past the picture's edge compute like the others and aren't written.
 
+#if !defined(PIXEL)
 #define PIXEL(p, x, y) \
     POSITION(x, y);    \
     SOURCE_PIXEL(p)
 #define PIXEL_IN_PLACE(p, x, y) \
     POSITION(x, y);             \
     WORK_PIXEL(p)
+#endif
 
 #define EACH_LANE(i) for (int i = 0; i < LANES; ++i)
+#if !defined(LANE_POSITION_IN)
+#define LANE_POSITION_IN(x, y, lanes, itemsX, itemsY) \
+    const int x = THREAD_X * LANES, y = THREAD_Y;     \
+    if (x >= (itemsX) || y >= (itemsY)) return;       \
+    const int lanes = x + LANES <= (itemsX) ? LANES : (itemsX)-x
+#endif
 #define LANE_POSITION(x, y, lanes) LANE_POSITION_IN(x, y, lanes, width, height)
 
 /// LANES pixels: x holds their blue, y green, z red, w alpha.
@@ -59,11 +67,19 @@ DEVICE_FUNCTION void FetchLanesOrClear(Lanes4* lanes, AnyFrame frame, int format
 
 /// Reads `count` neighbouring pixels from `index` on; the other lanes are zero.
 DEVICE_FUNCTION void ReadLanes(Lanes4* lanes, AnyFrame frame, int format, int index, int count) {
+    if (count == LANES) {
+        EACH_LANE(i) SetLane(lanes, i, LoadPixel(frame, format, index + i));
+        return;
+    }
     EACH_LANE(i) SetLane(lanes, i, i < count ? LoadPixel(frame, format, index + i) : Splat4(0.0f));
 }
 
 /// Writes the first `count` lanes to neighbouring pixels from `index` on.
 DEVICE_FUNCTION void WriteLanes(TargetFrame frame, int format, int index, int count, const Lanes4* lanes) {
+    if (count == LANES) {
+        EACH_LANE(i) StorePixel(frame, format, index + i, GetLane(lanes, i));
+        return;
+    }
     EACH_LANE(i) {
         if (i < count) StorePixel(frame, format, index + i, GetLane(lanes, i));
     }

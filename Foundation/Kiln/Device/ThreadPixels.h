@@ -2,8 +2,7 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-/// How a kernel gets at its pixels where each GPU thread has its own: OpenCL and CUDA. Arguments go by their fixed
-/// names.
+/// How a pointwise kernel gets at its pixels in CUDA, where each thread has its own. Arguments go by their fixed names.
 
 #define POSITION(x, y)                                                  \
     const int x = THREAD_X, y = THREAD_Y;                               \
@@ -15,8 +14,3 @@
 #define WORK_PIXEL(p) const Float4 p = LoadPixel(frame, format, threadY_ * pitch + threadX_)
 #define STORE(value) StorePixel(out, format, threadY_* outPitch + threadX_, value)
 #define STORE_WORK(value) StorePixel(frame, format, threadY_* pitch + threadX_, value)
-
-#define LANE_POSITION_IN(x, y, lanes, itemsX, itemsY) \
-    const int x = THREAD_X * LANES, y = THREAD_Y;     \
-    if (x >= (itemsX) || y >= (itemsY)) return;       \
-    const int lanes = x + LANES <= (itemsX) ? LANES : (itemsX)-x
