@@ -156,7 +156,7 @@ struct Film {
     Json (*tracks)(const std::string& folder);
 };
 constexpr Film kFilms[] = {
-    {"cut", &LongCut},      {"dissolves", &Dissolves},  {"nested cut", &Nested},
+    {"cut", &LongCut},       {"dissolves", &Dissolves},  {"nested cut", &Nested},
     {"adjusted", &Adjusted}, {"time-blended", &Blended}, {"picture in picture", &TwoLayers},
 };
 

@@ -21,22 +21,19 @@
     WriteLanes(frame, format, y_*(pitch) + firstX_, lanes_, &result_)
 #define FURTHER_PIXEL_(p, frame, pitch) const Float4 p = LoadPixel(frame, format, y_ * (pitch) + firstX_ + lane_)
 
+#define OPEN_PIXELS_(p, x, y, frame, pitch) \
+    OPEN_LANES_(y);                         \
+    READ_LANES_(frame, pitch);              \
+    EACH_LANE_INSIDE_ {                     \
+        const int x = firstX_ + lane_;      \
+        const Float4 p = GetLane(&pixels_, lane_)
+
 #define POSITION(x, y)  \
     OPEN_LANES_(y);     \
     EACH_LANE_INSIDE_ { \
         const int x = firstX_ + lane_
-#define PIXEL(p, x, y)                 \
-    OPEN_LANES_(y);                    \
-    READ_LANES_(in, inPitch);          \
-    EACH_LANE_INSIDE_ {                \
-        const int x = firstX_ + lane_; \
-        const Float4 p = GetLane(&pixels_, lane_)
-#define PIXEL_IN_PLACE(p, x, y)        \
-    OPEN_LANES_(y);                    \
-    READ_LANES_(frame, pitch);         \
-    EACH_LANE_INSIDE_ {                \
-        const int x = firstX_ + lane_; \
-        const Float4 p = GetLane(&pixels_, lane_)
+#define PIXEL(p, x, y) OPEN_PIXELS_(p, x, y, in, inPitch)
+#define PIXEL_IN_PLACE(p, x, y) OPEN_PIXELS_(p, x, y, frame, pitch)
 #define SOURCE_PIXEL(p) FURTHER_PIXEL_(p, in, inPitch)
 #define SECOND_PIXEL(p) FURTHER_PIXEL_(p, in2, in2Pitch)
 #define THIRD_PIXEL(p) FURTHER_PIXEL_(p, in3, in3Pitch)
