@@ -6,7 +6,10 @@
 /// C++17. Write plain C with vector types: no templates, overloads or references, an `f` on each constant.
 /// Docs/device-code.md shows the shapes of kernel.
 ///
-/// A file that wants wider lanes on the CPU says `#define CPU_LANES 64` before it includes this header.
+/// Before it includes this header a file may say
+///   #define CPU_LANES 64      for wider lanes on the CPU;
+///   #define PIXEL_PER_THREAD  where its pointwise kernels do so little that in OpenCL turning pixels into lanes, which
+///                             makes vector code of the others on a CPU, would cost more than it gains.
 
 #if defined(__OPENCL_VERSION__)
 #include "Kiln/Device/DialectOpenCL.h"

@@ -54,4 +54,8 @@ DEVICE_FUNCTION void StorePixel(TargetFrame frame, int format, int index, Float4
         ((__global float4*)frame)[index] = value;
 }
 
+#if defined(PIXEL_PER_THREAD)
+#include "Kiln/Device/ThreadPixels.h"
+#else
 #include "Kiln/Device/LanePixels.h"
+#endif

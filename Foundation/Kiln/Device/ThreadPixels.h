@@ -2,7 +2,8 @@
 // SPDX-License-Identifier: Apache-2.0
 #pragma once
 
-/// How a pointwise kernel gets at its pixels in CUDA, where each thread has its own. Arguments go by their fixed names.
+/// How a pointwise kernel gets at its pixels where each thread has its own: in CUDA, and in OpenCL where a file asks
+/// for it. Arguments go by their fixed names.
 
 #define POSITION(x, y)                                                  \
     const int x = THREAD_X, y = THREAD_Y;                               \
