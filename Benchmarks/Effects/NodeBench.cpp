@@ -33,6 +33,15 @@ const struct {
     const char* matchName;
     std::map<std::int32_t, double> settings;
 } kCases[] = {
+    {"Gaussian blur, sigma 10", "TQ.XQVE Gaussian Blur 2", {{0, 35.0}}},
+    {"Gaussian blur, sigma 100", "TQ.XQVE Gaussian Blur 2", {{0, 350.0}}},
+    {"Gaussian blur, sigma 100, size kept", "TQ.XQVE Gaussian Blur 2", {{0, 350.0}, {2, 1.0}}},
+    {"fast blur, sigma 10, size kept", "TQ.XQVE Fast Blur", {{0, 24.1}, {2, 1.0}}},
+    {"levels", "KL.XQVE Levels", {{0, 16.0}, {3, 235.0}}},
+    {"levels, gammas", "KL.XQVE Levels", {{4, 130.0}, {9, 90.0}, {14, 80.0}, {19, 110.0}}},
+    {"luma curve", "TQ.XQVE Luma Curve", {{9, 128.0}, {10, 150.0}}},
+    {"RGB curves", "TQ.XQVE RGB Curves", {{9, 128.0}, {10, 150.0}, {41, 128.0}, {42, 100.0}}},
+    {"video limiter", "TQ.XQVE Video Limiter", {}},
     {"sharpen", "TQ.XQVE Sharpen", {{0, 40.0}}},
     {"basic 3D", "TQ.XQVE Basic 3D", {{0, 30.0}, {1, 20.0}}},
     {"stabilizer, cropped and scaled", "TQ.XQVE SubspaceStabilizer", {}},
